@@ -1,0 +1,62 @@
+# Modules: a folder of sources, the modules below it that it may use, one object library.
+
+# Reads layers.txt into ORV_MODULES (bottom first) and ORV_USES_<module>.
+macro(orv_read_layers file)
+  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${file})
+  file(STRINGS ${file} orv_lines REGEX "^[a-z]")
+  set(ORV_MODULES "")
+  foreach(orv_line IN LISTS orv_lines)
+    string(REGEX MATCH "^([a-z]+):(.*)$" orv_matched "${orv_line}")
+    set(orv_name ${CMAKE_MATCH_1})
+    separate_arguments(orv_uses UNIX_COMMAND "${CMAKE_MATCH_2}")
+    foreach(orv_used IN LISTS orv_uses)
+      if(NOT orv_used IN_LIST ORV_MODULES)
+        message(FATAL_ERROR
+          "layers.txt: ${orv_name} may not use ${orv_used}, which does not stand below it")
+      endif()
+    endforeach()
+    list(APPEND ORV_MODULES ${orv_name})
+    set(ORV_USES_${orv_name} ${orv_uses})
+  endforeach()
+endmacro()
+
+# Sets the variable named by out to the sources of a folder that this platform compiles.
+function(orv_platform_sources out folder)
+  file(GLOB sources CONFIGURE_DEPENDS ${folder}/*.cpp)
+  foreach(suffix IN LISTS ORV_OTHER_PLATFORMS)
+    list(FILTER sources EXCLUDE REGEX "${suffix}(Test)?\\.cpp$")
+  endforeach()
+  set(${out} ${sources} PARENT_SCOPE)
+endfunction()
+
+# A module, as an object library. Whoever links it sees its headers and those of the modules it may
+# use, and compiles as a part of libORVresmgt.
+function(orv_add_module name folder)
+  orv_platform_sources(sources ${folder})
+  if(NOT sources)
+    return()
+  endif()
+  add_library(orv_${name} OBJECT ${sources})
+  target_link_libraries(orv_${name} PRIVATE orv_library_flags PUBLIC ORV::base)
+  target_compile_definitions(orv_${name} PUBLIC ORV_RESMGT_BUILDING)
+  target_include_directories(orv_${name} PUBLIC ${folder})
+  foreach(used IN LISTS ORV_USES_${name})
+    if(NOT used STREQUAL "base")
+      cmake_path(GET folder PARENT_PATH parent)
+      target_include_directories(orv_${name} PUBLIC ${parent}/${used})
+    endif()
+  endforeach()
+endfunction()
+
+# Links a program with a module and all modules below it.
+function(orv_link_module target name)
+  target_link_libraries(${target} PRIVATE orv_${name})
+  foreach(used IN LISTS ORV_USES_${name})
+    if(TARGET orv_${used})
+      target_link_libraries(${target} PRIVATE orv_${used})
+    endif()
+  endforeach()
+  if(WIN32)
+    target_link_libraries(${target} PRIVATE rpcrt4 winmm)
+  endif()
+endfunction()

@@ -1,0 +1,11 @@
+#include "inPackageInit.h"
+
+namespace Orv {
+
+namespace {
+
+const InPlainPackage<OrvInit::base> basePackage("base");
+
+}  // namespace
+
+}  // namespace Orv

@@ -1,0 +1,12 @@
+#include "exSysErrorWindows.h"
+
+#include "osError.h"
+
+namespace Orv {
+
+ExSysErrorWindows::ExSysErrorWindows(const char* file, int line, const char* step, int osError)
+    : ExConcrete(file, line), _osError(osError) {
+    setReason(std::string(step) + " failed: " + OsError::describe(osError));
+}
+
+}  // namespace Orv

@@ -1,0 +1,44 @@
+#pragma once
+
+#include <cstddef>
+#include <string_view>
+
+namespace Orv {
+
+/// A source file as errors report it: library folder and name, without the module's folder and the
+/// extension ("src/resmgt/lkMutex"). Made by the compiler from `__FILE__`; take it with ORV_FILE.
+template <std::size_t Capacity>
+struct SourceFile {
+    char chars[Capacity + 16] = {};  // at most "src/resmgt/" and the name
+
+    explicit consteval SourceFile(const char (&path)[Capacity]) {
+        const std::string_view whole(path, Capacity - 1);
+        append(folderOf(whole));
+        const std::string_view file = whole.substr(whole.find_last_of("/\\") + 1);
+        append(file.substr(0, file.rfind('.')));
+    }
+
+private:
+    std::size_t _length = 0;
+
+    static consteval std::string_view folderOf(std::string_view path) {
+        if (path.find("src/base/") != std::string_view::npos) return "src/base/";
+        if (path.find("src/resmgt/") != std::string_view::npos) return "src/resmgt/";
+        // Templates of the library that an installed header brings into another program.
+        if (path.find("/orv/") != std::string_view::npos) return "src/resmgt/";
+        return {};
+    }
+
+    consteval void append(std::string_view text) {
+        for (const char character : text) chars[_length++] = character;
+    }
+};
+
+}  // namespace Orv
+
+/// The current file as errors report it; a text that lives as long as the program.
+#define ORV_FILE                                                  \
+    ([]() noexcept -> const char* {                               \
+        static constexpr auto file = Orv::SourceFile(__FILE__);   \
+        return file.chars;                                        \
+    }())
