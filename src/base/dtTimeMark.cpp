@@ -16,7 +16,7 @@ std::int64_t DtTimeMark::getNanosecondsSince(const DtTimeMark& earlier) const no
 }
 
 DtTimeMark& DtTimeMark::operator+=(double seconds) noexcept {
-    _nanoseconds = Saturate::add(_nanoseconds, Saturate::round(seconds * 1e9));
+    _nanoseconds = Saturate::addRounded(_nanoseconds, seconds * 1e9);
     return *this;
 }
 

@@ -22,12 +22,12 @@ public:
         return __builtin_sub_overflow(a, b, &difference) ? (b < 0 ? MAX : MIN) : difference;
     }
 
-    /// The nearest count, halves away from zero; 0 for NaN.
-    static std::int64_t round(double value) noexcept {
-        if (std::isnan(value)) return 0;
+    /// Adds the count nearest to @p value, halves away from zero; NaN adds nothing.
+    static std::int64_t addRounded(std::int64_t count, double value) noexcept {
+        if (std::isnan(value)) return count;
         if (value >= 0x1p63) return MAX;
         if (value < -0x1p63) return MIN;
-        return std::llround(value);
+        return add(count, std::llround(value));
     }
 };
 
