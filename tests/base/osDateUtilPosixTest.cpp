@@ -1,7 +1,7 @@
 #include <ctime>
 
-#include "envVar.h"
 #include "osDateUtil.h"
+#include "zoneScope.h"
 
 namespace Orv {
 
@@ -10,30 +10,6 @@ namespace {
 using DateRep = OsDateTypes::DateRep;
 using DateStruct = OsDateTypes::DateStruct;
 using TimeMode = OsDateTypes::TimeMode;
-
-/// Puts the process into another time zone while it exists.
-class ZoneScope {
-public:
-    explicit ZoneScope(const char* zone) : _before(EnvVar("TZ").getText().value_or("")) {
-        set(zone);
-    }
-    ~ZoneScope() { set(_before); }
-
-private:
-    std::string _before;
-
-    static void set(const std::string& zone) {
-        std::string assignment("TZ=");
-        assignment.append(zone);
-        EnvVar::putEnv(assignment.c_str());
-        ::tzset();
-    }
-};
-
-// Rules written out, so that no database of zones is needed.
-const char* const BERLIN = "CET-1CEST,M3.5.0,M10.5.0/3";
-const char* const NEW_YORK = "EST5EDT,M3.2.0,M11.1.0";
-const char* const LORD_HOWE = "LHST-10:30LHDT-11,M10.1.0,M4.1.0";  // moves by half an hour
 
 DateStruct fieldsOf(int year, int month, int day, int hour, int minute) {
     DateStruct fields;
@@ -58,19 +34,19 @@ TEST(OsDateUtil, readsLocalTimesOfManyZones) {
         std::optional<std::int64_t> seconds;
     };
     const Row rows[] = {
-        {BERLIN, fieldsOf(2022, 7, 1, 12, 0), 1656669600},
-        {BERLIN, fieldsOf(2022, 1, 1, 12, 0), 1641034800},
-        {BERLIN, fieldsOf(2022, 3, 27, 1, 59), 1648342740},
-        {BERLIN, fieldsOf(2022, 3, 27, 2, 0), std::nullopt},
-        {BERLIN, fieldsOf(2022, 3, 27, 2, 59), std::nullopt},
-        {BERLIN, fieldsOf(2022, 3, 27, 3, 0), 1648342800},
-        {BERLIN, fieldsOf(2022, 10, 30, 2, 30), 1667089800},  // the first of two
-        {BERLIN, fieldsOf(2022, 10, 30, 3, 0), 1667095200},
-        {NEW_YORK, fieldsOf(2022, 3, 13, 2, 30), std::nullopt},
-        {NEW_YORK, fieldsOf(2022, 11, 6, 1, 30), 1667712600},
-        {NEW_YORK, fieldsOf(2022, 11, 6, 2, 30), 1667719800},
-        {LORD_HOWE, fieldsOf(2022, 10, 2, 2, 15), std::nullopt},
-        {LORD_HOWE, fieldsOf(2022, 4, 3, 1, 45), 1648910700},
+        {ZoneScope::BERLIN, fieldsOf(2022, 7, 1, 12, 0), 1656669600},
+        {ZoneScope::BERLIN, fieldsOf(2022, 1, 1, 12, 0), 1641034800},
+        {ZoneScope::BERLIN, fieldsOf(2022, 3, 27, 1, 59), 1648342740},
+        {ZoneScope::BERLIN, fieldsOf(2022, 3, 27, 2, 0), std::nullopt},
+        {ZoneScope::BERLIN, fieldsOf(2022, 3, 27, 2, 59), std::nullopt},
+        {ZoneScope::BERLIN, fieldsOf(2022, 3, 27, 3, 0), 1648342800},
+        {ZoneScope::BERLIN, fieldsOf(2022, 10, 30, 2, 30), 1667089800},  // the first of two
+        {ZoneScope::BERLIN, fieldsOf(2022, 10, 30, 3, 0), 1667095200},
+        {ZoneScope::NEW_YORK, fieldsOf(2022, 3, 13, 2, 30), std::nullopt},
+        {ZoneScope::NEW_YORK, fieldsOf(2022, 11, 6, 1, 30), 1667712600},
+        {ZoneScope::NEW_YORK, fieldsOf(2022, 11, 6, 2, 30), 1667719800},
+        {ZoneScope::LORD_HOWE, fieldsOf(2022, 10, 2, 2, 15), std::nullopt},
+        {ZoneScope::LORD_HOWE, fieldsOf(2022, 4, 3, 1, 45), 1648910700},
         {"XYZ12", fieldsOf(2022, 1, 1, 0, 0), 1641038400},
         {"XYZ-14", fieldsOf(2022, 1, 1, 0, 0), 1640944800},
         {"XYZ-14", fieldsOf(1, 1, 1, 0, 0), std::nullopt},       // still year 0 in UTC
@@ -85,7 +61,7 @@ TEST(OsDateUtil, readsLocalTimesOfManyZones) {
 }
 
 TEST(OsDateUtil, everyMinuteAroundAChangeOfClocksSurvivesLocalTime) {
-    for (const char* const zone : {BERLIN, NEW_YORK, LORD_HOWE}) {
+    for (const char* const zone : {ZoneScope::BERLIN, ZoneScope::NEW_YORK, ZoneScope::LORD_HOWE}) {
         const ZoneScope scope(zone);
         constexpr std::int64_t BEGIN_2022 = 1640995200;
         for (std::int64_t seconds = BEGIN_2022; seconds < BEGIN_2022 + 366 * 86400;
@@ -106,7 +82,7 @@ TEST(OsDateUtil, everyMinuteAroundAChangeOfClocksSurvivesLocalTime) {
 }
 
 TEST(OsDateUtil, formatsZoneNameAndOffset) {
-    const ZoneScope scope(BERLIN);
+    const ZoneScope scope(ZoneScope::BERLIN);
     char text[64];
     ASSERT_TRUE(
         OsDateUtil::format(text, sizeof text, "%H:%M %Z %z", *dateOf(1656669600), TimeMode::LOCAL));

@@ -9,8 +9,8 @@ namespace {
 
 using Generator = RnNumRecUniformRng<double>;
 
-// From the published definitions, computed with whole numbers of any size in another language:
-//   python3: m=2**64-1; see the recurrences named in the header; (word >> 11) is listed.
+// Computed in Python, whose numbers have no width, from the published recurrences: the upper 53
+// bits of each word.
 TEST(RnNumRecUniformRng, givesThePublishedSequenceOnEveryPlatform) {
     struct Row {
         std::uint64_t seed;
