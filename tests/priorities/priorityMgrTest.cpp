@@ -4,11 +4,13 @@
 #include <sstream>
 
 #include "expectThrows.h"
+#include "lgSink.h"
 #include "priority.h"
 #include "priorityEx.h"
 #include "priorityMgr.h"
 #include "priorityRelation.h"
 #include "rtPriorities.h"
+#include "traceManager.h"
 
 namespace Orv {
 
@@ -261,6 +263,36 @@ TEST(PriorityRelation, computesTheNumberNextToTheOtherSide) {
     EXPECT_EQ(equal.computeRhsPriority(5), 5);
     EXPECT_THROW(less.computeRhsPriority(std::numeric_limits<int>::max()), AssertionFailed);
     EXPECT_THROW(less.computeLhsPriority(std::numeric_limits<int>::min()), AssertionFailed);
+}
+
+/// Keeps what is traced.
+class CollectingSink : public LgSink {
+public:
+    std::string text;
+
+    void write(const LgRecord& record, const LgThread&) override { text += record.text; }
+    std::string getName() const override { return "collector"; }
+};
+
+TEST(PriorityMgr, tracesTheNumbersWhenTheyChange) {
+    const auto sink = std::make_shared<CollectingSink>();
+    TraceManager& tracing = TraceManager::getInstance();
+    tracing.setStandardErrorOn(false);
+    tracing.addSink(sink);
+    PriorityMgr mgr("mgr", 0, 31);
+    Priority a("a", mgr);
+    mgr.update();
+    mgr.enableTracing(true);
+    mgr.update();
+    tracing.flush();
+    EXPECT_EQ(sink->text, "");
+    Priority lower("lower", mgr);
+    const PriorityRelation below("lower<a", lower, Relation::LESS, a);
+    mgr.update();
+    tracing.flush();
+    EXPECT_THAT(sink->text, HasSubstr("\"lower<a\": lhs \"lower\" (0) <  rhs \"a\" (1) valid"));
+    tracing.removeSink(*sink);
+    tracing.setStandardErrorOn(true);
 }
 
 /// Mends what does not fit by dropping a relation, or lets it be.

@@ -242,7 +242,7 @@ public:
                 EXPECT_NE(_mgr.check(), PriorityMgr::NONE);
             }
             if (_random() % 2 == 0) upper.reset();
-            if (_random() % 4 == 0) lower.setPriority(static_cast<int>(_random() % 10));
+            if (_random() % 4 == 0) lower.setPriority(1 + static_cast<int>(_random() % 9));
         }
     }
 

@@ -1,6 +1,6 @@
-#include "priorityGraph.h"
-
 #include <algorithm>
+
+#include "priorityGraphPrivate.h"
 
 namespace Orv {
 

@@ -1,12 +1,20 @@
 #include "priorityMgr.h"
 
-#include <iostream>
 #include <iterator>
+#include <sstream>
 
 #include "assertions.h"
 #include "priorityNotifierPrivate.h"
+#include "traceLevel.h"
+#include "traceManager.h"
 
 namespace Orv {
+
+namespace {
+
+const TraceLevel traceLevel("priorities");
+
+}  // namespace
 
 PriorityMgr::PriorityMgr(const LiString& name, int min, int max)
     : _name(name),
@@ -169,7 +177,13 @@ void PriorityMgr::takeNumbersNoLock() {
         _notifier->noteNumber(*priority);
     }
     _isUpToDate = true;
-    if (hasChanged && _isTracing) dump(std::clog);
+    if (hasChanged && (_isTracing || traceLevel.isOn())) traceNumbers();
+}
+
+void PriorityMgr::traceNumbers() const {
+    std::ostringstream text;
+    dump(text);
+    TraceManager::getInstance().print(traceLevel, text.view());
 }
 
 void PriorityMgr::updateError(Error error) {

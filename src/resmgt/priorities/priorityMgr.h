@@ -54,9 +54,8 @@ public:
     /// Whether there are numbers for the present relations. Changes none and tells nobody.
     Error check();
 
-    void notify(NotifyType);  ///< Something has changed: the manager is not up to date.
-    void enableTracing(
-        bool);  ///< Whether updates that change a number dump the manager to the trace.
+    void notify(NotifyType);   ///< Something has changed: the manager is not up to date.
+    void enableTracing(bool);  ///< Of dumps after updates; also by the trace level "priorities".
 
     const LiString& getName() const noexcept { return _name; }
 
@@ -100,6 +99,7 @@ private:
     Error solveNoLock() ORV_REQUIRES(_lock);
     void bringUpToDateNoLock() ORV_REQUIRES(_lock);
     void takeNumbersNoLock() ORV_REQUIRES(_lock);
+    void traceNumbers() const;
     PriorityEx::ExTransientInvalid makeTransientInvalid() const ORV_REQUIRES(_lock);
     PriorityEx::ExRelationInvalid makeRelationInvalid() const ORV_REQUIRES(_lock);
 };

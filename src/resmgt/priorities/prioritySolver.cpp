@@ -5,9 +5,13 @@
 #include <limits>
 #include <utility>
 
+#include "priorityGraphPrivate.h"
+
 namespace Orv {
 
 namespace {
+
+using Arc = PriorityGraph::Arc;
 
 constexpr std::int64_t noNumber = std::numeric_limits<std::int64_t>::max();
 
@@ -111,15 +115,15 @@ PrioritySolver::Index PrioritySolver::addFixed(int number) {
 }
 
 void PrioritySolver::addEqual(Index lhs, Index rhs) {
-    _relations.push_back({{lhs, rhs, 0}, true});
+    _relations.push_back({lhs, rhs, 0, true});
 }
 
 void PrioritySolver::addLess(Index lhs, Index rhs) {
-    _relations.push_back({{lhs, rhs, 1}, false});
+    _relations.push_back({lhs, rhs, 1, false});
 }
 
 void PrioritySolver::addLessOrEqual(Index lhs, Index rhs) {
-    _relations.push_back({{lhs, rhs, 0}, false});
+    _relations.push_back({lhs, rhs, 0, false});
 }
 
 PrioritySolver::Outcome PrioritySolver::solve() {
@@ -136,8 +140,8 @@ void PrioritySolver::findEqualSets() {
     std::vector<Arc> arcs;
     arcs.reserve(2 * _relations.size());
     for (const Relation& relation : _relations) {
-        arcs.push_back(relation.arc);
-        if (relation.isEqual) arcs.push_back({relation.arc.to, relation.arc.from, 0});
+        arcs.push_back({relation.lhs, relation.rhs, relation.step});
+        if (relation.isEqual) arcs.push_back({relation.rhs, relation.lhs, 0});
     }
     _setOf = PriorityGraph(_fixedNumbers.size(), arcs).findClasses();
     const auto highest = std::max_element(_setOf.begin(), _setOf.end());
@@ -149,7 +153,7 @@ PriorityGraph PrioritySolver::relateSets() const {
     std::vector<Arc> arcs;
     arcs.reserve(_relations.size());
     for (const Relation& relation : _relations) {
-        const Arc arc{_setOf[relation.arc.from], _setOf[relation.arc.to], relation.arc.step};
+        const Arc arc{_setOf[relation.lhs], _setOf[relation.rhs], relation.step};
         if (arc.from != arc.to) arcs.push_back(arc);
     }
     return PriorityGraph(_sets.size(), arcs);
@@ -199,12 +203,11 @@ bool PrioritySolver::findBrokenRelation() {
     for (EqualSet& set : _sets) {
         if (!set.hasFixed) set.number = set.low;
     }
-    for (Index relation = 0; relation < _relations.size(); ++relation) {
-        const auto& [arc, isEqual] = _relations[relation];
-        const int lhs = getNumber(arc.from);
-        const int rhs = getNumber(arc.to);
-        if (isEqual ? lhs == rhs : arc.step == 0 ? lhs <= rhs : lhs < rhs) continue;
-        _culprit = relation;
+    for (Index index = 0; index < _relations.size(); ++index) {
+        const Relation& relation = _relations[index];
+        const std::int64_t lhs = getNumber(relation.lhs), rhs = getNumber(relation.rhs);
+        if (relation.isEqual ? lhs == rhs : lhs + relation.step <= rhs) continue;
+        _culprit = index;
         return true;
     }
     return false;

@@ -4,10 +4,11 @@
 #include <cstdint>
 #include <vector>
 
-#include "priorityGraph.h"
 #include "resmgtApi.h"
 
 namespace Orv {
+
+class PriorityGraph;
 
 /// Finds numbers for priorities of which only relations, a range and some numbers are known.
 ///
@@ -60,10 +61,10 @@ public:
     bool isTied(Index priority) const noexcept;
 
 private:
-    using Arc = PriorityGraph::Arc;
-
     struct Relation {
-        Arc arc;
+        Index lhs;
+        Index rhs;
+        int step;  // by which the right one stands above the left one at least
         bool isEqual;
     };
 
