@@ -24,8 +24,8 @@ bool LkEvent::timedWait(double seconds) {
 }
 
 void LkEvent::dump(std::ostream& stream) const {
-    stream << "Event \"" << _name << "\" " << (_queue.getNbReleases() > 0 ? "set" : "not set")
-           << (_queue.hasWaiters() ? ", threads wait" : "") << '\n';
+    stream << "LkEvent \"" << _name << "\" " << (_queue.getNbReleases() > 0 ? "set" : "not set")
+           << (_queue.hasWaiters() ? ", threads wait" : "");
 }
 
 }  // namespace Orv

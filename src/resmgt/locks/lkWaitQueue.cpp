@@ -1,10 +1,29 @@
 #include "lkWaitQueue.h"
 
+#include <thread>
 #include <utility>
 
+#include "assertions.h"
+#include "lkNative.h"
 #include "lkWaiterPrivate.h"
 
 namespace Orv {
+
+namespace {
+
+/// Gives a mutex up for the time of a wait, whatever ends that.
+class Released {
+public:
+    explicit Released(LkMutex::Native& mutex) : _mutex(mutex) { _mutex.unlock(); }
+    ~Released() noexcept(false) { _mutex.relock(); }
+    Released(const Released&) = delete;
+    Released& operator=(const Released&) = delete;
+
+private:
+    LkMutex::Native& _mutex;
+};
+
+}  // namespace
 
 LkWaitQueue::LkWaitQueue(Memory memory, std::uint32_t nbReleases) noexcept
     : _word(nbReleases * ONE_RELEASE), _memory(memory) {}
@@ -63,6 +82,31 @@ bool LkWaitQueue::wait(const LkTimeLimit& limit) {
     if (limit.isZero()) return false;
     const LkWaiter::Use waiter;
     return !enter(*waiter) || await(*waiter, limit);
+}
+
+bool LkWaitQueue::wait(const LkMutex& externalMutex, const LkTimeLimit& limit) {
+    LkMutex::Native& mutex = externalMutex.getImp();
+    ORV_ASSERT_TEXT(mutex.isHeldOnceByCaller(), "externalMutex.getImp().isHeldOnceByCaller()");
+    if (!tryWait()) {
+        if (!limit.isZero()) {
+            const LkWaiter::Use waiter;
+            if (enter(*waiter)) {
+                const Released released(mutex);
+                return await(*waiter, limit);
+            }
+        } else {
+            return giveWay(mutex, false);
+        }
+    }
+    // Only what is used up cannot keep its waiter going round for ever.
+    return _memory == Memory::COUNTS || giveWay(mutex, true);
+}
+
+/// Lets the thread have the mutex that is to change what the caller waits for in a loop.
+bool LkWaitQueue::giveWay(LkMutex::Native& mutex, bool result) {
+    const Released released(mutex);
+    std::this_thread::yield();
+    return result;
 }
 
 bool LkWaitQueue::tryWait() noexcept {

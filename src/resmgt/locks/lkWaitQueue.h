@@ -4,12 +4,12 @@
 #include <cstdint>
 
 #include "lkAdaptiveWait.h"
+#include "lkMutex.h"
 #include "lkTimeLimit.h"
 #include "resmgtApi.h"
 
 namespace Orv {
 
-class LkMutex;
 class LkWaiter;
 
 /// What semaphores, events, pulses and condition variables are made of: threads that wait in the
@@ -49,9 +49,9 @@ public:
     bool wait(const LkTimeLimit& limit);
     bool tryWait() noexcept;  ///< Takes, or sees, a remembered release.
 
-    /// Joins the queue, releases @p mutex for the time of the wait and holds it again on return,
+    /// Joins the queue, releases @p externalMutex for the time of the wait and holds it again on return,
     /// in every outcome. A wait that need not sleep gives others the mutex for a moment, too.
-    bool wait(const LkMutex& mutex, const LkTimeLimit& limit);
+    bool wait(const LkMutex& externalMutex, const LkTimeLimit& limit);
 
     std::uint32_t getNbReleases() const noexcept;  ///< Remembered ones; a snapshot.
     bool hasWaiters() const noexcept;              ///< A snapshot.
@@ -75,6 +75,7 @@ private:
     Word lock() noexcept;
     void lockContended() noexcept;
     void unlock(Word releases) noexcept;
+    static bool giveWay(LkMutex::Native& mutex, bool result);
     bool enter(LkWaiter& waiter) noexcept;
     bool await(LkWaiter& waiter, const LkTimeLimit& limit);
     bool leave(LkWaiter& waiter) noexcept;
