@@ -7,6 +7,8 @@ if(WIN32)
 else()
   set(public_platform_headers exSysErrorPosix.h)
 endif()
+# Headers that only their own library uses.
+set(internal_headers inPackageRegistry.h)
 
 # The public headers of a module's folder.
 function(orv_public_headers out folder)
@@ -14,6 +16,9 @@ function(orv_public_headers out folder)
   set(result "")
   foreach(header IN LISTS headers)
     cmake_path(GET header FILENAME file)
+    if(file IN_LIST internal_headers)
+      continue()
+    endif()
     if(file IN_LIST public_platform_headers
        OR NOT file MATCHES "(Native|Posix|Windows|WinNT|Private)\\.h$")
       list(APPEND result ${header})
@@ -61,8 +66,11 @@ write_basic_package_version_file(${CMAKE_BINARY_DIR}/ORVConfigVersion.cmake
   COMPATIBILITY SameMinorVersion)
 install(FILES ${CMAKE_BINARY_DIR}/ORVConfig.cmake ${CMAKE_BINARY_DIR}/ORVConfigVersion.cmake
         DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/ORV)
+# The pkg-config files find their prefix from where they lie, so the folder may be moved.
+set(pkg_config_folder ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+file(RELATIVE_PATH ORV_PC_TO_PREFIX /prefix/${pkg_config_folder} /prefix)
 foreach(library base resmgt)
   configure_file(cmake/orv-${library}.pc.in ${CMAKE_BINARY_DIR}/orv-${library}.pc @ONLY)
   install(FILES ${CMAKE_BINARY_DIR}/orv-${library}.pc
-          DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+          DESTINATION ${pkg_config_folder})
 endforeach()

@@ -27,4 +27,8 @@ void InPackageInit::shutdownAll() {
     InPackageRegistry::getInstance().shutdownAll();
 }
 
+std::vector<std::string> InPackageInit::getInitializedNames() {
+    return InPackageRegistry::getInstance().getInitializedNames();
+}
+
 }  // namespace Orv

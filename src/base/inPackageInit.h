@@ -37,6 +37,9 @@ public:
     /// running; the first exception is thrown at the end.
     static void shutdownAll();
 
+    /// Names of the packages that are up, in the order they came up.
+    static std::vector<std::string> getInitializedNames();
+
 protected:
     /// @param name  borrowed for ever.
     /// @param type  identity of the package, InInit<Tag>::getType().

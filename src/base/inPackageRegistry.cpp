@@ -119,6 +119,13 @@ void InPackageRegistry::shutdownAll() {
     if (firstError) std::rethrow_exception(firstError);
 }
 
+std::vector<std::string> InPackageRegistry::getInitializedNames() {
+    const std::lock_guard guard(_mutex);
+    std::vector<std::string> names;
+    for (const InPackageInit* package : _initialized) names.emplace_back(package->getName());
+    return names;
+}
+
 void InPackageRegistry::shutDownTo(std::size_t nbPackages, std::exception_ptr& firstError) {
     while (_initialized.size() > nbPackages) {
         InPackageInit* const package = _initialized.back();

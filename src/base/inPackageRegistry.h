@@ -19,6 +19,7 @@ public:
     void remove(InPackageInit& package) noexcept;
     void initializeAll();
     void shutdownAll();
+    std::vector<std::string> getInitializedNames();
 
 private:
     enum class State { OPEN, WORKING, SHUT_DOWN };

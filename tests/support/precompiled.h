@@ -1,10 +1,9 @@
 #pragma once
 
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
-
 #include <atomic>
 #include <functional>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 #include <memory>
 #include <sstream>
 #include <string>

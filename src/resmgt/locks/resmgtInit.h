@@ -1,8 +1,11 @@
 #pragma once
 
 #include "inInit.h"
+#include "resmgtApi.h"
 
-namespace Orv::OrvInit {
+namespace Orv {
+
+namespace OrvInit {
 
 // Tags of the packages of libORVresmgt; each module defines the objects of its own packages.
 
@@ -20,4 +23,14 @@ class deviceProtocol {};     ///< The device side: properties, streams, state ma
 class deviceManager {};      ///< The application's side: registry, manager and access objects.
 class resmgt {};             ///< The whole library: who depends on it depends on all of it.
 
-}  // namespace Orv::OrvInit
+}  // namespace OrvInit
+
+/// Kept inside libORVresmgt, so that a program whose package depends on OrvInit::resmgt loads the
+/// library even if it calls nothing else in it.
+template <>
+class InInit<OrvInit::resmgt> {
+public:
+    ORV_RESMGT_API static const std::type_info& getType() noexcept;
+};
+
+}  // namespace Orv

@@ -18,4 +18,8 @@ const InPlainPackage<OrvInit::resmgt, OrvInit::memoryBuffers, OrvInit::syncEngin
 
 }  // namespace
 
+const std::type_info& InInit<OrvInit::resmgt>::getType() noexcept {
+    return typeid(OrvInit::resmgt);
+}
+
 }  // namespace Orv

@@ -1,0 +1,38 @@
+#include "lkMutexPosix.h"
+
+#include <cerrno>
+#include <ostream>
+
+#include "assertions.h"
+#include "lkEx.h"
+#include "lkSpinner.h"
+
+namespace Orv {
+
+bool LkMutexPosix::spinLock(unsigned tries) {
+    if (_futex.isHeldByCaller()) {
+        throw LkEx::ExDeadLock(ORV_FILE, __LINE__, "LkMutexPosix", _name, 0, "self deadlock");
+    }
+    LkSpinner spinner;
+    do {
+        if (_futex.tryLock()) return true;
+    } while (--tries != 0 && spinner.pause());  // 0 tries wrap around to very many
+    return lock();
+}
+
+void LkMutexPosix::failAbandoned() {
+    unlock();
+    Assertions::throwSysAssertionFailed(ORV_FILE, __LINE__, "_futex.lock( WATCH_OWNER )",
+                                        EOWNERDEAD);
+}
+
+void LkMutexPosix::failNotOwner() {
+    Assertions::throwSysAssertionFailed(ORV_FILE, __LINE__, "_futex.unlock()", EPERM);
+}
+
+void LkMutexPosix::dump(std::ostream& stream) const {
+    stream << "LkMutex \"" << _name << "\" holder " << _futex.getOwner() << " count "
+           << _futex.getDepth();
+}
+
+}  // namespace Orv

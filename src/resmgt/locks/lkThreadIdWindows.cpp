@@ -1,0 +1,11 @@
+#include <windows.h>
+
+#include "lkThreadId.h"
+
+namespace Orv {
+
+void LkThreadId::setCurrentThread() noexcept {
+    _number = ::GetCurrentThreadId();
+}
+
+}  // namespace Orv
