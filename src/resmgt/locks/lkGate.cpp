@@ -79,9 +79,9 @@ void LkGate::dump(std::ostream& stream) const {
     stream << "\nGate cond var: ";
     _gate->dump(stream);
     stream << "\nGatekeeper sema: "
-           << (!_useGateKeeper      ? "unused"
+           << (!_useGateKeeper     ? "unused"
                : _isKeeperExpected ? "set"
-                                    : "not set")
+                                   : "not set")
            << '\n';
 }
 

@@ -23,7 +23,8 @@ public:
     /// @param name  shown by dump(); borrowed, must outlive the gate.
     LkGate(const char* name, int numGatees, bool useGateKeeper);
 
-    /// Takes over the gate, which is left empty and can only be destroyed. Nobody uses it meanwhile.
+    /// Takes over the gate, which is left empty and can only be destroyed. Nobody uses it
+    /// meanwhile.
     LkGate(LkGate& other);
     LkGate& operator=(const LkGate&) = delete;
 

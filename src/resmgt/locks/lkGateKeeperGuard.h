@@ -8,11 +8,11 @@ namespace Orv {
 /// long as it lives.
 ///
 /// - Threads: made by one thread at a time, which is none of the participants.
-class [[nodiscard]] ORV_RESMGT_API LkGateKeeperGuard {
+class ORV_RESMGT_API LkGateKeeperGuard {
 public:
     /// Asserts that the gate has a gatekeeper.
     /// @param gate  borrowed, must outlive the guard.
-    explicit LkGateKeeperGuard(LkGate& gate);
+    [[nodiscard]] explicit LkGateKeeperGuard(LkGate& gate);
     ~LkGateKeeperGuard() noexcept(false);  ///< Opens the gate.
 
     LkGateKeeperGuard(const LkGateKeeperGuard&) = delete;

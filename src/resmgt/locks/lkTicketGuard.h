@@ -5,11 +5,11 @@
 namespace Orv {
 
 /// A thread's turn: waits for its number and passes the turn on when it goes.
-class [[nodiscard]] ORV_RESMGT_API LkTicketGuard {
+class ORV_RESMGT_API LkTicketGuard {
 public:
     /// @param ticket  borrowed, must outlive the guard.
     /// @param number  as LkTicket::waitForTicket.
-    LkTicketGuard(LkTicket& ticket, std::int64_t number) : _ticket(ticket) {
+    [[nodiscard]] LkTicketGuard(LkTicket& ticket, std::int64_t number) : _ticket(ticket) {
         _ticket.waitForTicket(number);
     }
     ~LkTicketGuard() noexcept(false) { _ticket.next(); }

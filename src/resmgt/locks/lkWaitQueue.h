@@ -49,8 +49,9 @@ public:
     bool wait(const LkTimeLimit& limit);
     bool tryWait() noexcept;  ///< Takes, or sees, a remembered release.
 
-    /// Joins the queue, releases @p externalMutex for the time of the wait and holds it again on return,
-    /// in every outcome. A wait that need not sleep gives others the mutex for a moment, too.
+    /// Joins the queue, releases @p externalMutex for the time of the wait and holds it again on
+    /// return, in every outcome. A wait that need not sleep gives others the mutex for a moment,
+    /// too.
     bool wait(const LkMutex& externalMutex, const LkTimeLimit& limit);
 
     std::uint32_t getNbReleases() const noexcept;  ///< Remembered ones; a snapshot.
