@@ -26,7 +26,7 @@ bool LkCondVar::performTimedWait(const LkMutex& mutex, double seconds) {
 }
 
 void LkCondVar::dump(std::ostream& stream) const {
-    stream << "LkCondVar \"" << _name << "\" " << (_queue.hasWaiters() ? "threads wait" : "idle");
+    stream << "LkCondVar \"" << _name << "\" waiting " << _queue.getNbWaiters();
 }
 
 }  // namespace Orv

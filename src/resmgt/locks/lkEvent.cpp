@@ -25,7 +25,7 @@ bool LkEvent::timedWait(double seconds) {
 
 void LkEvent::dump(std::ostream& stream) const {
     stream << "LkEvent \"" << _name << "\" " << (_queue.getNbReleases() > 0 ? "set" : "not set")
-           << (_queue.hasWaiters() ? ", threads wait" : "");
+           << ", waiting " << _queue.getNbWaiters();
 }
 
 }  // namespace Orv

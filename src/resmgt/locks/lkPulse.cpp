@@ -30,8 +30,7 @@ bool LkPulse::performTimedWait(const LkMutex& mutex, double seconds) {
 
 void LkPulse::dump(std::ostream& stream) const {
     stream << "LkPulse \"" << _name << "\" wakes " << (_wakeType == WAKE_ALL ? "all" : "one")
-           << ", pending " << _queue.getNbReleases()
-           << (_queue.hasWaiters() ? ", threads wait" : "");
+           << ", pending " << _queue.getNbReleases() << ", waiting " << _queue.getNbWaiters();
 }
 
 }  // namespace Orv

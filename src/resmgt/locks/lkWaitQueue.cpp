@@ -61,7 +61,7 @@ bool LkWaitQueue::release() noexcept {
 }
 
 void LkWaitQueue::releaseAll() noexcept {
-    if (!hasWaiters()) return;
+    if ((_word.load(std::memory_order_acquire) & (LOCKED | WAITERS)) == 0) return;
     const Word word = lock();
     LkWaiter* const all = detachAll();
     unlock(word);
@@ -130,13 +130,17 @@ std::uint32_t LkWaitQueue::getNbReleases() const noexcept {
     return static_cast<std::uint32_t>(_word.load(std::memory_order_acquire) / ONE_RELEASE);
 }
 
-bool LkWaitQueue::hasWaiters() const noexcept {
-    return (_word.load(std::memory_order_acquire) & WAITERS) != 0;
+std::uint32_t LkWaitQueue::getNbWaiters() const noexcept {
+    std::uint32_t nbWaiters = 0;
+    const Word word = lock();
+    for (const LkWaiter* waiter = _first; waiter != nullptr; waiter = waiter->_next) ++nbWaiters;
+    unlock(word);
+    return nbWaiters;
 }
 
 // --- the lock ---
 
-LkWaitQueue::Word LkWaitQueue::lock() noexcept {
+LkWaitQueue::Word LkWaitQueue::lock() const noexcept {
     Word word = _word.load(std::memory_order_relaxed);
     for (;;) {
         if ((word & LOCKED) != 0) {
@@ -149,7 +153,7 @@ LkWaitQueue::Word LkWaitQueue::lock() noexcept {
     }
 }
 
-void LkWaitQueue::lockContended() noexcept {
+void LkWaitQueue::lockContended() const noexcept {
     const auto tryLock = [this](Word flags) {
         Word word = _word.load(std::memory_order_relaxed);
         return (word & LOCKED) == 0 &&
@@ -173,7 +177,7 @@ void LkWaitQueue::lockContended() noexcept {
     }
 }
 
-void LkWaitQueue::unlock(Word releases) noexcept {
+void LkWaitQueue::unlock(Word releases) const noexcept {
     const Word word = releases | (_first != nullptr ? WAITERS : 0);
     const Word old = _word.exchange(word, std::memory_order_acq_rel);
     if ((old & CONTENDED) != 0) LkAddressWait::wakeOne(&_word);

@@ -55,7 +55,7 @@ public:
     bool wait(const LkMutex& externalMutex, const LkTimeLimit& limit);
 
     std::uint32_t getNbReleases() const noexcept;  ///< Remembered ones; a snapshot.
-    bool hasWaiters() const noexcept;              ///< A snapshot.
+    std::uint32_t getNbWaiters() const noexcept;   ///< For diagnostics: walks along the queue.
 
 private:
     // One word, so that giving up the lock and telling the news are the same moment:
@@ -67,15 +67,15 @@ private:
     static constexpr Word ONE_RELEASE = Word{1} << 32;
     static constexpr Word RELEASES = ~Word{0} << 32;
 
-    std::atomic<Word> _word;
+    mutable std::atomic<Word> _word;
     LkWaiter* _first = nullptr;  // guarded by LOCKED, as is all of the list
     LkWaiter* _last = nullptr;
     LkAdaptiveWait _adaptive;
     const Memory _memory;
 
-    Word lock() noexcept;
-    void lockContended() noexcept;
-    void unlock(Word releases) noexcept;
+    Word lock() const noexcept;
+    void lockContended() const noexcept;
+    void unlock(Word releases) const noexcept;
     static bool giveWay(LkMutex::Native& mutex, bool result);
     bool enter(LkWaiter& waiter) noexcept;
     bool await(LkWaiter& waiter, const LkTimeLimit& limit);
