@@ -1,0 +1,7 @@
+#include "lkAsyncHandle.h"
+
+namespace Orv {
+
+LkAsyncHandle::~LkAsyncHandle() = default;
+
+}  // namespace Orv

@@ -1,0 +1,11 @@
+#include <cerrno>
+
+#include "lkSemaTypes.h"
+
+namespace Orv {
+
+int LkSemaTypes::getCountError() noexcept {
+    return EINVAL;
+}
+
+}  // namespace Orv

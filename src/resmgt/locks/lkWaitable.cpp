@@ -1,0 +1,7 @@
+#include "lkWaitable.h"
+
+namespace Orv {
+
+LkWaitable::~LkWaitable() = default;
+
+}  // namespace Orv
