@@ -88,6 +88,8 @@ bool LgQueue::push(const LgRecord& record) noexcept {
 
 std::int64_t LgQueue::observe(std::int64_t now) noexcept {
     _isFinalView = _isAbandoned.load(std::memory_order_acquire);
+    _nbObservedLost =
+        _nbLost.load(std::memory_order_acquire);  // before the look at what was pushed
     const std::uint64_t progress = _progress.load(std::memory_order_seq_cst);
     if (progress % 2 == 0) {
         _quietUntil = now;
@@ -114,8 +116,8 @@ void LgQueue::pop() noexcept {
 }
 
 std::uint64_t LgQueue::takeNbLost() noexcept {
-    const std::uint64_t nbLost = _nbLost.load(std::memory_order_acquire);
-    return nbLost - std::exchange(_nbReportedLost, nbLost);
+    if (front() != nullptr) return 0;
+    return _nbObservedLost - std::exchange(_nbReportedLost, _nbObservedLost);
 }
 
 bool LgQueue::isFinished() const noexcept {

@@ -47,8 +47,11 @@ public:
     const LgRecord* front() const noexcept;  ///< The oldest record; null at the end.
     void pop() noexcept;                     ///< Removes the oldest record.
 
-    std::uint64_t takeNbLost() noexcept;  ///< Records dropped since the last call.
-    bool isFinished() const noexcept;     ///< Empty, and the creator had exited when observed.
+    /// Records dropped since the last call and before observe(). 0 while there are any to read, so
+    /// that the loss is reported behind what was logged before it.
+    std::uint64_t takeNbLost() noexcept;
+
+    bool isFinished() const noexcept;  ///< Empty, and the creator had exited when observed.
 
     const LgThread& getThread() const noexcept { return _thread; }
     void renameThread(std::string_view name) { _thread.name = name; }
@@ -74,6 +77,7 @@ private:
 
     alignas(64) std::atomic<std::uint64_t> _head{0};  // number of records popped
     std::uint64_t _observedProgress = 0;
+    std::uint64_t _nbObservedLost = 0;
     std::uint64_t _nbReportedLost = 0;
     std::int64_t _observedAt = 0;  // when observe() was called last
     std::int64_t _quietUntil = 0;  // what observe() has returned

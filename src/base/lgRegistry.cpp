@@ -15,10 +15,19 @@ namespace Orv {
 
 using std::chrono::milliseconds;
 
+/// A thread's part in the log.
+struct LgRegistry::ThreadState {
+    LgThread thread;
+    LgQueue* queue = nullptr;  // null before the first record and after unregisterThread()
+
+    static void end(void* state) noexcept;
+};
+
 struct LgRegistry::Parts {
     LgDrainLock lock;
     LgDrain drain ORV_GUARDED_BY(lock);
     LgWakeup wakeup;
+    LgThreadSlot threadSlot{ThreadState::end};
     const std::shared_ptr<LgSink> standardError = std::make_shared<LgStandardErrorSink>();
 
     LgDrain::Result drainOnce(LgRegistry& registry) noexcept ORV_REQUIRES(lock);
@@ -36,22 +45,6 @@ constexpr milliseconds LONGEST_FLUSH(1000);
 constexpr milliseconds LONGEST_FLUSH_AT_EXIT(250);
 constexpr milliseconds READER_PATIENCE(100);
 
-// The thread's queue, without destructor so that it can be used until the thread's very end.
-thread_local LgQueue* threadQueue = nullptr;
-thread_local bool isThreadDraining = false;  // it is in a pass: a sink may be calling
-thread_local bool hasThreadEnded = false;    // nothing notices an end after this
-
-/// Who the thread is in the log, and the notice that it ends.
-struct ThreadIdentity {
-    LgThread thread;
-
-    ~ThreadIdentity() {
-        hasThreadEnded = true;
-        LgRegistry::getInstance().unregisterThread();
-    }
-};
-thread_local ThreadIdentity threadIdentity;
-
 }  // namespace
 
 LgRegistry& LgRegistry::getInstance() {
@@ -68,54 +61,66 @@ LgRegistry::LgRegistry() : _parts(std::make_unique<Parts>()) {
 
 // The calling thread
 
-LgQueue* LgRegistry::makeQueue() noexcept {
-    try {
-        const auto newThread = [this] {
-            return LgThread{.number = _nbThreads.fetch_add(1, std::memory_order_relaxed) + 1,
-                            .osId = LgSystem::getThreadId()};
-        };
-        if (hasThreadEnded) return new LgQueue(newThread());  // for one record
-        LgThread& thread = threadIdentity.thread;
-        if (thread.number == 0) {
-            std::string name = std::move(thread.name);
-            thread = newThread();
-            thread.name = std::move(name);
-        }
-        threadQueue = new LgQueue(thread);
-        return threadQueue;
-    } catch (...) {
-        return nullptr;  // out of memory
-    }
+LgThread LgRegistry::makeThread() {
+    return {.number = _nbThreads.fetch_add(1, std::memory_order_relaxed) + 1,
+            .osId = LgSystem::getThreadId()};
+}
+
+/// The calling thread's state, made at first; null when the thread's end has been noticed.
+LgRegistry::ThreadState* LgRegistry::getState() {
+    void* const value = _parts->threadSlot.get();
+    if (value == LgThreadSlot::ENDED) return nullptr;
+    if (value != nullptr) return static_cast<ThreadState*>(value);
+    auto state = std::make_unique<ThreadState>(ThreadState{.thread = makeThread()});
+    _parts->threadSlot.set(state.get());
+    return state.release();
+}
+
+void LgRegistry::ThreadState::end(void* state) noexcept {
+    const std::unique_ptr<ThreadState> ended(static_cast<ThreadState*>(state));
+    if (ended->queue != nullptr) getInstance().abandon(*ended->queue);
 }
 
 void LgRegistry::registerThread(std::string_view name) {
-    if (hasThreadEnded) return;
-    threadIdentity.thread.name = name;
-    if (threadQueue == nullptr) {
-        if (makeQueue() == nullptr) throw std::bad_alloc();
-    } else if (!threadQueue->_isPublished) {
-        threadQueue->renameThread(name);
+    ThreadState* const state = getState();
+    if (state == nullptr) return;
+    state->thread.name = name;
+    if (state->queue == nullptr) {
+        state->queue = new LgQueue(state->thread);
+    } else if (!state->queue->_isPublished) {
+        state->queue->renameThread(name);
     } else {
         log({.kind = LgRecord::Kind::THREAD_NAME, .text = name});
     }
 }
 
 void LgRegistry::unregisterThread() noexcept {
-    LgQueue* const queue = std::exchange(threadQueue, nullptr);
+    void* const value = _parts->threadSlot.get();
+    if (value == nullptr || value == LgThreadSlot::ENDED) return;
+    LgQueue* const queue = std::exchange(static_cast<ThreadState*>(value)->queue, nullptr);
     if (queue != nullptr) abandon(*queue);
 }
 
 void LgRegistry::log(const LgRecord& record) noexcept {
-    if (isThreadDraining) return;
-    LgQueue* const queue = threadQueue != nullptr ? threadQueue : makeQueue();
-    if (queue == nullptr) return;
-    if (!queue->_isPublished) publish(*queue);
-    queue->push(record);
-    if (hasThreadEnded) {
-        abandon(*queue);
-    } else {
-        announce();
+    if (_parts->lock.isHeldByCaller()) return;
+    try {
+        if (ThreadState* const state = getState()) {
+            if (state->queue == nullptr) state->queue = new LgQueue(state->thread);
+            push(*state->queue, record);
+            announce();
+        } else {  // nothing would notice that the thread has left a queue behind
+            const auto queue = new LgQueue(makeThread());
+            push(*queue, record);
+            abandon(*queue);
+        }
+    } catch (...) {
+        // No memory for a queue: the record is lost.
     }
+}
+
+void LgRegistry::push(LgQueue& queue, const LgRecord& record) noexcept {
+    if (!queue._isPublished) publish(queue);
+    queue.push(record);
 }
 
 void LgRegistry::publish(LgQueue& queue) noexcept {
@@ -172,7 +177,6 @@ void LgRegistry::handOver() noexcept {
 
 LgDrain::Result LgRegistry::Parts::drainOnce(LgRegistry& registry) noexcept {
     registry._isPending.store(false, std::memory_order_seq_cst);
-    isThreadDraining = true;
     LgDrain::Result result;
     try {
         const std::int64_t now = LgClock::now();
@@ -181,7 +185,6 @@ LgDrain::Result LgRegistry::Parts::drainOnce(LgRegistry& registry) noexcept {
     } catch (...) {
         // Out of memory: everything stays queued, and the caller learns that nothing was written.
     }
-    isThreadDraining = false;
     return result;
 }
 
@@ -190,7 +193,7 @@ bool LgRegistry::flush() noexcept {
 }
 
 bool LgRegistry::flushWithin(milliseconds limit) noexcept {
-    if (isThreadDraining) return false;
+    if (_parts->lock.isHeldByCaller()) return false;
     const std::int64_t start = LgClock::now();
     const std::int64_t end = start + std::chrono::nanoseconds(limit).count();
     while (_parts->lock.lockWithin(limit)) {
@@ -201,6 +204,7 @@ bool LgRegistry::flushWithin(milliseconds limit) noexcept {
         if (LgClock::now() >= end) return false;
         std::this_thread::sleep_for(milliseconds(1));  // a thread is in the middle of logging
     }
+    drainPending();
     return false;
 }
 
@@ -214,7 +218,7 @@ void LgRegistry::drainAtExit() noexcept {
 /// Runs the action on the list of sinks while no sink is being called.
 template <class Action>
 void LgRegistry::changeSinks(Action action) {
-    ORV_ASSERT_TEXT(!isThreadDraining, "no sink calls this");
+    ORV_ASSERT_TEXT(!_parts->lock.isHeldByCaller(), "no sink calls this");
     _parts->lock.lock();
     std::exception_ptr error;
     try {

@@ -61,11 +61,14 @@ public:
 private:
     friend class LgReader;
     struct Parts;
+    struct ThreadState;
 
     LgRegistry();
     ~LgRegistry() = delete;  // lives as long as the process
 
-    LgQueue* makeQueue() noexcept;
+    LgThread makeThread();
+    ThreadState* getState();
+    void push(LgQueue& queue, const LgRecord& record) noexcept;
     void publish(LgQueue& queue) noexcept;
     void abandon(LgQueue& queue) noexcept;
     void announce() noexcept;

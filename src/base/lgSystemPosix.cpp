@@ -1,12 +1,17 @@
 #include "lgSystemPosix.h"
 
 #include <cstdlib>
+#include <pthread.h>
 #include <unistd.h>
 
 namespace Orv {
 
 std::uint64_t LgSystemPosix::getThreadId() noexcept {
     return static_cast<std::uint64_t>(::gettid());
+}
+
+std::uint64_t LgSystemPosix::getThreadToken() noexcept {
+    return static_cast<std::uint64_t>(::pthread_self());
 }
 
 std::uint64_t LgSystemPosix::getProcessId() noexcept {

@@ -1,11 +1,16 @@
 #include "lgSystemWindows.h"
 
 #include <cstdlib>
+#include <initializer_list>
 #include <windows.h>
 
 namespace Orv {
 
 std::uint64_t LgSystemWindows::getThreadId() noexcept {
+    return ::GetCurrentThreadId();
+}
+
+std::uint64_t LgSystemWindows::getThreadToken() noexcept {
     return ::GetCurrentThreadId();
 }
 

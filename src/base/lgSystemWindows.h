@@ -9,6 +9,10 @@ namespace Orv {
 class LgSystemWindows {
 public:
     static std::uint64_t getThreadId() noexcept;  ///< Of the calling thread.
+
+    /// Tells the calling thread from all others that run; faster than its id, never 0.
+    static std::uint64_t getThreadToken() noexcept;
+
     static std::uint64_t getProcessId() noexcept;
 
     /// Has the handler called when the process exits, while other threads still run.

@@ -8,7 +8,6 @@
 #include <vector>
 
 #include "baseApi.h"
-#include "threadSafety.h"
 
 namespace Orv {
 
@@ -59,8 +58,9 @@ private:
     void remove(const TraceLevel& level) noexcept;
 
     mutable std::mutex _mutex;
-    std::vector<const TraceLevel*> _levels ORV_GUARDED_BY(_mutex);
-    std::map<std::string, bool, std::less<>> _wishes ORV_GUARDED_BY(_mutex);  // by level name
+    // Guarded by _mutex:
+    std::vector<const TraceLevel*> _levels;
+    std::map<std::string, bool, std::less<>> _wishes;  // by level name
 };
 
 }  // namespace Orv

@@ -55,7 +55,7 @@ TEST_F(LgExitDeathTest, staticDestructorsMayLog) {
 
 TEST_F(LgExitDeathTest, aSinkThatHangsHoldsUpNoExit) {
     const auto story = [] {
-        static LgTestGate gate;  // never opened
+        static LgTestGate& gate = *new LgTestGate;  // never opened
         const auto sink = std::make_shared<LgCollectingSink>();
         sink->onWrite = [](const LgRecord&) { gate.pass(); };
         TraceManager::getInstance().addSink(sink);

@@ -31,7 +31,6 @@ protected:
     void waitForReader() {
         for (std::thread::id writer;
              writer == std::thread::id() || writer == std::this_thread::get_id();) {
-            std::atomic<bool> isWritten{false};
             const auto probe = std::make_shared<LgCollectingSink>();
             probe->onWrite = [&](const LgRecord&) { writer = std::this_thread::get_id(); };
             registry.addSink(probe);
@@ -77,7 +76,6 @@ TEST_F(LgReaderTest, writesTheRecordsOfManyThreadsInTimeOrder) {
 
 TEST_F(LgReaderTest, keepsLoggingThreadsFromWaitingForASink) {
     LgTestGate gate;
-    std::atomic<int> nbWritten{0};
     sink->onWrite = [&](const LgRecord& record) {
         if (record.text == "stop here") gate.pass();
     };

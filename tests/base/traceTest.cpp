@@ -40,7 +40,7 @@ TEST_F(TraceTest, printsWhatCameBeforeAnOperandThatThrows) {
     const TraceLevel level("trace test", true);
     const auto fail = []() -> int { throw std::runtime_error("no value"); };
     EXPECT_THROW(ORV_TRACE(level) << "value " << fail(), std::runtime_error);
-    EXPECT_LE(sink->take().size(), 1U);  // whether the stream was made first is the compiler's
+    EXPECT_EQ(sink->takeTexts(), Texts{"value "});
 }
 
 TEST_F(TraceTest, levelsAreSwitchedByNameAlsoThoseThatComeLater) {
@@ -76,7 +76,7 @@ TEST_F(TraceTest, aLineCarriesItsLevelsNameAndSeverity) {
 }
 
 TEST_F(TraceTest, levelsMayBeSwitchedMadeAndUnmadeWhileOthersTrace) {
-    const TraceLevel level("trace test");
+    const TraceLevel level("trace test busy");
     std::atomic<bool> isStopped{false};
     std::vector<std::jthread> threads;
     for (int i = 0; i < 3; ++i) {
@@ -87,7 +87,7 @@ TEST_F(TraceTest, levelsMayBeSwitchedMadeAndUnmadeWhileOthersTrace) {
     do {
         for (int i = 0; i < 200; ++i) {
             const TraceLevel guest("trace test guest");
-            manager.switchLevel("trace test", i % 2 == 0);
+            manager.switchLevel("trace test busy", i % 2 == 0);
             manager.switchAll(i % 3 == 0);
             manager.getLevelNames();
         }
