@@ -30,7 +30,8 @@ std::optional<std::int64_t> countToMinute(const OsDateTypes::DateStruct& fields)
                                           std::chrono::month(static_cast<unsigned>(fields.month)),
                                           std::chrono::day(static_cast<unsigned>(fields.day)));
     if (!day.ok()) return std::nullopt;
-    return Seconds(Days(day).time_since_epoch()).count() + fields.hour * 3600 + fields.minute * 60;
+    return Seconds(Days(day).time_since_epoch()).count() + std::int64_t{3600} * fields.hour +
+           std::int64_t{60} * fields.minute;
 }
 
 }  // namespace
