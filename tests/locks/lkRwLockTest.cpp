@@ -1,11 +1,10 @@
-#include "lkRwLock.h"
-
 #include <gtest/gtest.h>
 
 #include "cpuTime.h"
 #include "eventually.h"
 #include "gate.h"
 #include "lkMutexAttr.h"
+#include "lkRwLock.h"
 #include "waitTesting.h"
 
 namespace Orv {
@@ -69,8 +68,8 @@ TEST(LkRwLock, letsAWaitingWriterGoBeforeNewReaders) {
                 const LkReadGuard later(lock);
                 EXPECT_EQ(order, "ww");
             });
-            ASSERT_TRUE(waitForDump(
-                lock, "name lock rwLock 1 wr wait 2 rd wait " + std::to_string(i)));
+            ASSERT_TRUE(
+                waitForDump(lock, "name lock rwLock 1 wr wait 2 rd wait " + std::to_string(i)));
         }
     }
     threads.clear();

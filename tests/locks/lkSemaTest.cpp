@@ -1,13 +1,11 @@
-#include "lkSema.h"
-
-#include <gtest/gtest.h>
-
 #include <cmath>
+#include <gtest/gtest.h>
 
 #include "expectThrows.h"
 #include "lkCondVarAttr.h"
 #include "lkMutexAttr.h"
 #include "lkNamedSema.h"
+#include "lkSema.h"
 #include "lkUnnamedSema.h"
 #include "waitTesting.h"
 
