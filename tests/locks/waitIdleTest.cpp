@@ -40,7 +40,7 @@ public:
     }
 
     /// Keeps releasing until every thread has been through its wait, and leaves nothing pending.
-    void letAllThrough() {
+    void letAllThrough() ORV_NO_THREAD_SAFETY_ANALYSIS {
         ++_nbRounds;
         const int nbThreads = static_cast<int>(_threads.size());
         _writer.unlock();
