@@ -9,7 +9,7 @@
   PACKAGES_BENCH=(libbenchmark-dev pkg-config python3 libabsl-dev libboost-dev libboost-thread-dev
     libconcurrentqueue-dev libglib2.0-dev libpoco-dev libpugixml-dev libtbb-dev libxml2-dev
     qt6-base-dev)
-  PACKAGES_DOCS=(doxygen graphviz)
+  PACKAGES_DOCS=(doxygen graphviz python3)
   PACKAGES_CHECK=(clang-format-19 clang-tidy-19 pkg-config python3 shellcheck)
 }
 

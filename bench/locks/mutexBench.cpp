@@ -2,13 +2,11 @@
 // time. Ours are taken as users take them: through a guard, from the shared library.
 #include <absl/synchronization/mutex.h>
 #include <benchmark/benchmark.h>
-
 #include <mutex>
-#include <string>
-
 #include <orv/lkLock.h>
 #include <orv/lkMutex.h>
 #include <orv/lkRecLock.h>
+#include <string>
 
 namespace {
 
@@ -56,7 +54,7 @@ void contended(benchmark::State& state) {
 template <class Peer>
 void registerPeer(const std::string& name) {
     benchmark::RegisterBenchmark(("lock+unlock/" + name).c_str(), alone<Peer>);
-    benchmark::RegisterBenchmark(("2 threads contended/" + name).c_str(), contended<Peer>)
+    benchmark::RegisterBenchmark(("contended/" + name).c_str(), contended<Peer>)
         ->Threads(2)
         ->UseRealTime();
 }

@@ -24,6 +24,7 @@ template <class T>
 class ArrayPtr {
     static_assert(std::is_trivially_copyable_v<T> && std::is_trivially_destructible_v<T>,
                   "the C allocator runs neither constructors nor destructors");
+    static_assert(alignof(T) <= alignof(std::max_align_t), "the C allocator aligns no further");
 
 public:
     ArrayPtr() noexcept = default;

@@ -13,8 +13,8 @@ class ORV_BASE_API AssertionEx : public ExBase, public std::logic_error {
 public:
     const char* what() const noexcept override;
 
-    const char* getExpression() const noexcept;             ///< The asserted expression's text.
-    int getOsError() const noexcept { return _osError; }    ///< 0 where there was none.
+    const char* getExpression() const noexcept;           ///< The asserted expression's text.
+    int getOsError() const noexcept { return _osError; }  ///< 0 where there was none.
 
 protected:
     AssertionEx(const char* file, int line, const char* expression, int osError);

@@ -1,7 +1,9 @@
 #include "assertions.h"
 
-#include <cstdio>
 #include <exception>
+
+#include "currentException.h"
+#include "trace.h"
 
 namespace Orv {
 
@@ -42,17 +44,11 @@ void Assertions::reportSysAssertionFailed(const char* file, int line, const char
 }
 
 void Assertions::traceCurrentException(const char* where) noexcept {
-    const char* reason = "an exception of unknown type";
+    const TraceLevel& level = TraceLevel::getMain();
     try {
-        throw;
-    } catch (const ExBase& exception) {
-        reason = exception.what();
-        std::fprintf(stderr, "Error while %s: %s\n", where, reason);
-    } catch (const std::exception& exception) {
-        reason = exception.what();
-        std::fprintf(stderr, "Error while %s: %s\n", where, reason);
+        ORV_TRACE(level) << "Error while " << where << ": " << describeCurrentException();
     } catch (...) {
-        std::fprintf(stderr, "Error while %s: %s\n", where, reason);
+        ORV_TRACE(level) << "Error while " << where << ", and no memory to describe it";
     }
 }
 

@@ -44,5 +44,4 @@ public:
 
 /// ORV_ASSERT for a destructor.
 #define ORV_ASSERT_IN_DESTRUCTOR(condition) \
-    ((condition) ? void()                   \
-                 : Orv::Assertions::reportAssertionFailed(ORV_FILE, __LINE__, #condition))
+    ((condition) ? void() : Orv::Assertions::reportAssertionFailed(ORV_FILE, __LINE__, #condition))

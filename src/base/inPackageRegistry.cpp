@@ -122,6 +122,7 @@ void InPackageRegistry::shutdownAll() {
 std::vector<std::string> InPackageRegistry::getInitializedNames() {
     const std::lock_guard guard(_mutex);
     std::vector<std::string> names;
+    names.reserve(_initialized.size());
     for (const InPackageInit* package : _initialized) names.emplace_back(package->getName());
     return names;
 }

@@ -27,7 +27,7 @@ private:
     // Recursive: a hook may ask for what it is part of. Held while hooks run, so that whoever asks
     // meanwhile returns when all packages are up.
     std::recursive_mutex _mutex;
-    std::vector<InPackageInit*> _packages;  // in order of registration
+    std::vector<InPackageInit*> _packages;     // in order of registration
     std::vector<InPackageInit*> _initialized;  // in the order they came up
     std::atomic<bool> _isUpToDate{false};
     State _state = State::OPEN;

@@ -18,7 +18,8 @@ class ObjPtrRet;
 /// on by copying uses std::unique_ptr instead; for shared ownership there is RCShdPtr.
 ///
 /// - Threads: one pointer object is used by one thread at a time.
-/// - Errors: what the object's destructor throws reaches the caller of reset() and assignment, after
+/// - Errors: what the object's destructor throws reaches the caller of reset() and assignment,
+/// after
 ///   the pointer has its new value; the pointer's own destructor traces it.
 template <class T>
 class ObjPtr {
@@ -50,7 +51,8 @@ public:
 
     /// Takes over what @p other owns and destroys its own object; on itself does nothing.
     ObjPtr& operator=(ObjPtr other) {
-        // A pointer is emptied on its way into the parameter, so assigning it to itself is a round trip.
+        // A pointer is emptied on its way into the parameter, so assigning it to itself is a round
+        // trip.
         reset(other.release());
         return *this;
     }

@@ -22,6 +22,11 @@ public:
         return __builtin_sub_overflow(a, b, &difference) ? (b < 0 ? MAX : MIN) : difference;
     }
 
+    static constexpr std::int64_t multiply(std::int64_t a, std::int64_t b) noexcept {
+        std::int64_t product = 0;
+        return __builtin_mul_overflow(a, b, &product) ? ((a < 0) == (b < 0) ? MAX : MIN) : product;
+    }
+
     /// Adds the count nearest to @p value, halves away from zero; NaN adds nothing.
     static std::int64_t addRounded(std::int64_t count, double value) noexcept {
         if (std::isnan(value)) return count;

@@ -26,7 +26,7 @@ WaitableTimerWindows::~WaitableTimerWindows() {
     ::CloseHandle(_timer);
 }
 
-void WaitableTimerWindows::waitUntil(const DtTimeMark& deadline) {
+void WaitableTimerWindows::waitUntil(const DtTimeMark& deadline, void* orObject) {
     // The timer counts from its start and may end a little early by the clock, so look again.
     constexpr std::int64_t LONGEST_NANOSECONDS = 3'600'000'000'000;  // keeps the sum in range
     for (;;) {
@@ -36,8 +36,11 @@ void WaitableTimerWindows::waitUntil(const DtTimeMark& deadline) {
         due.QuadPart = -((std::min(left, LONGEST_NANOSECONDS) + 99) / 100);  // relative, 100 ns
         ORV_ASSERT_SYS(::SetWaitableTimer(_timer, &due, 0, nullptr, nullptr, FALSE) != 0,
                        "::SetWaitableTimer( _timer )", OsError::getLast());
-        ORV_ASSERT_SYS(::WaitForSingleObject(_timer, INFINITE) == WAIT_OBJECT_0,
-                       "::WaitForSingleObject( _timer, INFINITE ) == WAIT_OBJECT_0",
+        const HANDLE objects[] = {_timer, orObject};
+        const DWORD result =
+            ::WaitForMultipleObjects(orObject == nullptr ? 1 : 2, objects, FALSE, INFINITE);
+        if (result == WAIT_OBJECT_0 + 1) return;
+        ORV_ASSERT_SYS(result == WAIT_OBJECT_0, "::WaitForMultipleObjects() == WAIT_OBJECT_0",
                        OsError::getLast());
     }
 }

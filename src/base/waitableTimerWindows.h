@@ -16,7 +16,9 @@ public:
     WaitableTimerWindows(const WaitableTimerWindows&) = delete;
     WaitableTimerWindows& operator=(const WaitableTimerWindows&) = delete;
 
-    void waitUntil(const DtTimeMark& deadline);
+    /// Waits until the deadline or, if that comes first, until the kernel object @p orObject (an
+    /// event's HANDLE, or null) is signalled.
+    void waitUntil(const DtTimeMark& deadline, void* orObject = nullptr);
 
 private:
     void* _timer;  // HANDLE, never null

@@ -1,8 +1,7 @@
-#include "inPackageInit.h"
-
 #include <gtest/gtest.h>
 
 #include "inEx.h"
+#include "inPackageInit.h"
 
 namespace Orv {
 

@@ -47,6 +47,10 @@ double getTestLimitSeconds() {
 void TestWatchdog::install() {
     prepareThreadStacks();
     static auto* const watchdog = new TestWatchdog;
+    // A death test's program hears of no progress. Its time is shorter, so that it tells first.
+    const bool isOfDeathTest = !GTEST_FLAG_GET(internal_run_death_test).empty();
+    watchdog->_limitSeconds = getTestLimitSeconds() * (isOfDeathTest ? 0.5 : 1);
+    watchdog->watch(isOfDeathTest ? "the program of a death test" : "the program's start");
     testing::UnitTest::GetInstance()->listeners().Append(new ProgressListener(*watchdog));
     std::thread([] { watchdog->run(); }).detach();
 }
@@ -55,25 +59,19 @@ void TestWatchdog::watch(const std::string& what) {
     const std::lock_guard guard(_mutex);
     _watched = what;
     _deadline = Clock::now() + std::chrono::duration_cast<Clock::duration>(
-                                   std::chrono::duration<double>(getTestLimitSeconds()));
+                                   std::chrono::duration<double>(_limitSeconds));
     _changed.notify_one();
 }
 
 void TestWatchdog::run() {
     std::unique_lock lock(_mutex);
-    while (Clock::now() < _deadline) {
-        if (_deadline == Clock::time_point::max()) {
-            _changed.wait(lock);
-        } else {
-            _changed.wait_until(lock, _deadline);
-        }
-    }
+    while (Clock::now() < _deadline) _changed.wait_until(lock, _deadline);
     strike();
 }
 
 void TestWatchdog::strike() const {
     std::fprintf(stderr, "\n[ WATCHDOG ] %s took more than %g seconds; the threads are at:\n",
-                 _watched.c_str(), getTestLimitSeconds());
+                 _watched.c_str(), _limitSeconds);
     writeThreadStacks();
     std::fflush(stderr);
     std::_Exit(EXIT_FAILURE);

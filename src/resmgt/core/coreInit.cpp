@@ -5,14 +5,14 @@ namespace Orv {
 
 namespace {
 
-const InPlainPackage<OrvInit::smartPtrs, OrvInit::locks, OrvInit::base>
-    smartPtrsPackage("smartPtrs");
+const InPlainPackage<OrvInit::smartPtrs, OrvInit::locks, OrvInit::base> smartPtrsPackage(
+    "smartPtrs");
 
-const InPlainPackage<OrvInit::containers, OrvInit::smartPtrs, OrvInit::base>
-    containersPackage("containers");
+const InPlainPackage<OrvInit::containers, OrvInit::smartPtrs, OrvInit::base> containersPackage(
+    "containers");
 
-const InPlainPackage<OrvInit::literals, OrvInit::smartPtrs, OrvInit::base>
-    literalsPackage("literals");
+const InPlainPackage<OrvInit::literals, OrvInit::smartPtrs, OrvInit::base> literalsPackage(
+    "literals");
 
 }  // namespace
 

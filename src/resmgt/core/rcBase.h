@@ -34,6 +34,21 @@ protected:
         return *this;
     }  ///< Holders stay with their object.
 
+    // For the pointers, and for a class that counts its own way, which hides them.
+
+    void incReferenceCount() const noexcept { ++_count; }
+
+    void decReferenceCount() const {
+        if (--_count == 0) destroyUnheld();
+    }
+
+    int getReferenceCount() const noexcept { return read(_count); }
+
+    void destroyUnheld() const {
+        write(_count, BEING_DESTROYED);
+        delete this;
+    }
+
 private:
     template <class T>
     friend class RCBasePtr;
@@ -45,23 +60,12 @@ private:
 
     mutable C _count{0};
 
-    void incReferenceCount() const noexcept { ++_count; }
-
-    void decReferenceCount() const {
-        if (--_count == 0) destroyUnheld();
-    }
-
-    int getReferenceCount() const noexcept { return read(_count); }
-
-    void destroyUnheld() const {
-        _count = BEING_DESTROYED;
-        delete this;
-    }
-
     static int read(int count) noexcept { return count; }
     static int read(const LkCounter<long>& count) noexcept {
         return static_cast<int>(count.getValue());
     }
+    static void write(int& count, int value) noexcept { count = value; }
+    static void write(LkCounter<long>& count, int value) noexcept { count.setUnshared(value); }
 };
 
 }  // namespace Orv

@@ -23,7 +23,7 @@ protected:
     /// Deletes the object. Unlike `delete this` it lets the destructor put the object into counted
     /// pointers without destroying it twice.
     void deleteThis() {
-        _count = RCBase<C>::BEING_DESTROYED;
+        RCBase<C>::write(_count, RCBase<C>::BEING_DESTROYED);
         delete this;
     }
 

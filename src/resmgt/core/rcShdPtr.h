@@ -58,6 +58,9 @@ public:
     friend bool operator==(const RCShdPtr& left, const RCShdPtr<U>& right) noexcept {
         return left.get() == right.get();
     }
+    friend bool operator==(const RCShdPtr& pointer, std::nullptr_t) noexcept {
+        return pointer.get() == nullptr;
+    }
     friend std::strong_ordering operator<=>(const RCShdPtr& left, const RCShdPtr& right) noexcept {
         return std::compare_three_way()(left.get(), right.get());
     }

@@ -32,6 +32,11 @@ public:
     long operator++() noexcept { return ++_value; }
     long operator--() noexcept { return --_value; }
 
+    /// Like an assignment, for a counter that no other thread uses just now: a plain store.
+    void setUnshared(long value) noexcept {
+        _value.store(narrow(value), std::memory_order_relaxed);
+    }
+
     /// Each returns the value before.
     long operator++(int) noexcept { return _value++; }
     long operator--(int) noexcept { return _value--; }

@@ -1,0 +1,32 @@
+#pragma once
+
+#include <cstdint>
+#include <filesystem>
+#include <string>
+#include <string_view>
+
+namespace Orv {
+
+/// A file that the log writes; every write goes straight to the system.
+class LgFilePosix {
+public:
+    /// Creates or empties the file. @throws ExSysError
+    explicit LgFilePosix(const std::filesystem::path& path);
+    ~LgFilePosix();
+
+    LgFilePosix(const LgFilePosix&) = delete;
+    LgFilePosix& operator=(const LgFilePosix&) = delete;
+
+    // Each gives 0 or the operating system's error.
+    int append(std::string_view text) noexcept;
+    int writeAt(std::int64_t offset, std::string_view text) noexcept;
+    int truncate(std::int64_t length) noexcept;
+    static int writeToStandardError(std::string_view text) noexcept;
+
+    static std::string describe(const std::filesystem::path& path);  ///< In UTF-8.
+
+private:
+    int _descriptor;
+};
+
+}  // namespace Orv

@@ -1,0 +1,7 @@
+#include "lgSink.h"
+
+namespace Orv {
+
+LgSink::~LgSink() = default;
+
+}  // namespace Orv
