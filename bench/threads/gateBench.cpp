@@ -1,8 +1,7 @@
 // Barriers: two threads meet again and again.
+#include <barrier>
 #include <benchmark/benchmark.h>
 #include <orv/lkGate.h>
-
-#include <barrier>
 #include <thread>
 
 namespace {

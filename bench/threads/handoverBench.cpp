@@ -1,24 +1,23 @@
 // Hand-over between two threads: one asks, the other answers, and the round trip is timed. With a
 // partner that answers at once, one that takes 200 microseconds, and while every processor is busy
 // with something else.
+#include <atomic>
 #include <benchmark/benchmark.h>
+#include <chrono>
+#include <condition_variable>
+#include <ctime>
 #include <linux/futex.h>
+#include <mutex>
 #include <orv/lkCondVar.h>
 #include <orv/lkEvent.h>
 #include <orv/lkPulse.h>
 #include <orv/lkSema.h>
 #include <orv/lkUnnamedSema.h>
 #include <semaphore.h>
-#include <sys/syscall.h>
-#include <unistd.h>
-
-#include <atomic>
-#include <chrono>
-#include <condition_variable>
-#include <ctime>
-#include <mutex>
 #include <semaphore>
+#include <sys/syscall.h>
 #include <thread>
+#include <unistd.h>
 #include <vector>
 
 #include "latency.h"
@@ -196,9 +195,8 @@ void measure(benchmark::State& state, std::chrono::microseconds delay) {
             latency.add(Clock::now() - start);
         }
     }
-    state.counters["cpu per trip"] =
-        benchmark::Counter(1e9 * (getCpuSeconds() - cpuSeconds) /
-                           static_cast<double>(state.iterations()));
+    state.counters["cpu per trip"] = benchmark::Counter(1e9 * (getCpuSeconds() - cpuSeconds) /
+                                                        static_cast<double>(state.iterations()));
     latency.report(state);
 }
 

@@ -1,9 +1,8 @@
 // Read-write locks: one reader, two readers, and two threads that write once in a hundred reads.
+#include <QReadWriteLock>
 #include <absl/synchronization/mutex.h>
 #include <benchmark/benchmark.h>
 #include <orv/lkRwLock.h>
-
-#include <QReadWriteLock>
 #include <shared_mutex>
 #include <string>
 

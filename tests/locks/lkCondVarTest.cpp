@@ -1,9 +1,8 @@
-#include "lkCondVar.h"
-
 #include <gtest/gtest.h>
 
 #include "expectThrows.h"
 #include "gate.h"
+#include "lkCondVar.h"
 #include "lkCondVarAttr.h"
 #include "waitTesting.h"
 
@@ -147,13 +146,17 @@ TEST(LkCondVar, handsOverAmong64Threads) {
     EXPECT_EQ(nbItems, 0);
 }
 
-TEST(LkCondVar, assertsThatTheCallerHoldsTheMutexExactlyOnce) {
-    Shared shared;
+void waitWithTheMutexHeldNotAtAllOrTwice(Shared& shared) ORV_NO_THREAD_SAFETY_ANALYSIS {
     EXPECT_THROW(shared.condVar.wait(shared.mutex), AssertionFailed);
     const LkGuard guard(shared.mutex);
     const LkGuard again(shared.mutex);
     EXPECT_THROW(shared.condVar.wait(guard), AssertionFailed);
     EXPECT_TRUE(shared.mutex.isLocked());
+}
+
+TEST(LkCondVar, assertsThatTheCallerHoldsTheMutexExactlyOnce) {
+    Shared shared;
+    waitWithTheMutexHeldNotAtAllOrTwice(shared);
     EXPECT_EQ(dumpOf(shared.condVar), "LkCondVar \"condition\" waiting 0");
 }
 
@@ -181,7 +184,9 @@ TEST(LkCondVar, mayBeDestroyedByAWaiterThatWasSignalledWithoutTheMutex) {
             shared.condVar.wait(guard);
         },
         [](Shared& shared) {
-            { const LkGuard guard(shared.mutex); }  // free once the thread is in the queue
+            {
+                const LkGuard guard(shared.mutex);
+            }  // free once the thread is in the queue
             shared.condVar.signal();
         });
 }

@@ -1,9 +1,8 @@
-#include "lkEvent.h"
-
 #include <gtest/gtest.h>
 
 #include "eventually.h"
 #include "gate.h"
+#include "lkEvent.h"
 #include "waitTesting.h"
 
 namespace Orv {

@@ -1,10 +1,9 @@
-#include "lkGate.h"
-
 #include <gtest/gtest.h>
 
 #include "eventually.h"
 #include "expectThrows.h"
 #include "gate.h"
+#include "lkGate.h"
 #include "lkGateKeeperGuard.h"
 #include "rcEx.h"
 #include "waitTesting.h"

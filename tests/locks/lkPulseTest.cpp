@@ -1,9 +1,8 @@
-#include "lkPulse.h"
-
 #include <gtest/gtest.h>
 
 #include "expectThrows.h"
 #include "gate.h"
+#include "lkPulse.h"
 #include "lkPulsePool.h"
 #include "rcEx.h"
 #include "waitTesting.h"
@@ -151,18 +150,22 @@ TEST(LkPulse, givesTheMutexToOthersAlsoWhenItNeedNotWait) {
     EXPECT_TRUE(isDone);
 }
 
+void waitWithoutHoldingTheMutexOnce(Pulsed& one, double seconds) ORV_NO_THREAD_SAFETY_ANALYSIS {
+    EXPECT_THROW(one.pulse.timedWait(one.mutex, seconds), AssertionFailed);
+    const LkGuard guard(one.mutex);
+    const LkGuard again(one.mutex);
+    EXPECT_THROW(one.pulse.timedWait(guard, seconds), AssertionFailed);
+    EXPECT_TRUE(one.mutex.isLocked());
+    std::jthread other([&]() ORV_NO_THREAD_SAFETY_ANALYSIS {
+        EXPECT_THROW(one.pulse.timedWait(one.mutex, seconds), AssertionFailed);
+        EXPECT_FALSE((LkGuard(one.mutex, TRY).isLocked()));
+    });
+}
+
 TEST(LkPulse, assertsThatTheCallerHoldsTheMutexExactlyOnce) {
     for (const double seconds : {0.0, 10.0}) {
         Pulsed one;
-        EXPECT_THROW(one.pulse.timedWait(one.mutex, seconds), AssertionEx);
-        const LkGuard guard(one.mutex);
-        const LkGuard again(one.mutex);
-        EXPECT_THROW(one.pulse.timedWait(guard, seconds), AssertionEx);
-        EXPECT_TRUE(one.mutex.isLocked());
-        std::jthread([&] {
-            EXPECT_FALSE((LkGuard(one.mutex, TRY).isLocked()));
-            EXPECT_THROW(one.pulse.timedWait(one.mutex, seconds), AssertionEx);
-        }).join();
+        waitWithoutHoldingTheMutexOnce(one, seconds);
         EXPECT_EQ(dumpOf(one.pulse), "LkPulse \"pulse\" wakes one, pending 0, waiting 0");
     }
 }

@@ -1,13 +1,11 @@
-#include "lkTicket.h"
-
-#include <gtest/gtest.h>
-
 #include <algorithm>
+#include <gtest/gtest.h>
 #include <numeric>
 #include <random>
 
 #include "expectThrows.h"
 #include "gate.h"
+#include "lkTicket.h"
 #include "lkTicketGuard.h"
 #include "waitTesting.h"
 

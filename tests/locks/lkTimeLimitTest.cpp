@@ -1,9 +1,8 @@
-#include "lkTimeLimit.h"
-
-#include <gtest/gtest.h>
-
 #include <cmath>
+#include <gtest/gtest.h>
 #include <limits>
+
+#include "lkTimeLimit.h"
 
 namespace Orv {
 
@@ -32,7 +31,8 @@ TEST(LkTimeLimit, roundsSecondsToMillisecondsAndCutsWhatNoSystemCanCount) {
         {__LINE__, huge, LkTimeLimit::LONGEST_MILLISECONDS},
     };
     for (const Row& row : rows) {
-        EXPECT_EQ(LkTimeLimit::toMilliseconds(row.seconds), row.milliseconds) << "line " << row.line;
+        EXPECT_EQ(LkTimeLimit::toMilliseconds(row.seconds), row.milliseconds)
+            << "line " << row.line;
         const LkTimeLimit limit(row.seconds);
         EXPECT_FALSE(limit.isInfinite()) << "line " << row.line;
         EXPECT_EQ(limit.isZero(), row.milliseconds == 0) << "line " << row.line;

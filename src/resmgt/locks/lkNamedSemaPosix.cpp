@@ -50,7 +50,10 @@ public:
         if (_error == 0) _error = lockFile(_folder, LOCK_EX);
     }
     ~Folder() {
-        if (_folder >= 0) ::close(_folder);
+        if (_folder < 0) return;
+        // Said aloud: a child that was forked meanwhile has the descriptor, too, until its exec.
+        lockFile(_folder, LOCK_UN);
+        ::close(_folder);
     }
     Folder(const Folder&) = delete;
     Folder& operator=(const Folder&) = delete;
@@ -171,6 +174,7 @@ int LkNamedSemaPosix::close() noexcept {
         // Without memory for a path the file stays behind, as if this process had died here.
     }
     ::munmap(_word, sizeof(Word));
+    lockFile(_file, LOCK_UN);
     ::close(std::exchange(_file, -1));
     return error == ENOENT ? 0 : error;
 }

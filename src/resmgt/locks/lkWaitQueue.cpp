@@ -25,6 +25,8 @@ private:
 
 }  // namespace
 
+static_assert(sizeof(LkWaitQueue) == 32);
+
 LkWaitQueue::LkWaitQueue(Memory memory, std::uint32_t nbReleases) noexcept
     : _word(nbReleases * ONE_RELEASE), _memory(memory) {}
 
