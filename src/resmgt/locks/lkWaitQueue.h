@@ -39,7 +39,7 @@ public:
     LkWaitQueue& operator=(const LkWaitQueue&) = delete;
 
     /// Releases the first thread, all threads if releases last.
-    /// @return false, and nothing is done, if @ref HIGHEST_COUNT releases are remembered already.
+    /// @return false, and nothing is done, if HIGHEST_COUNT releases are remembered already.
     bool release() noexcept;
     void releaseAll() noexcept;  ///< Every thread that waits; remembers nothing. For FORGETS.
     void reset() noexcept;       ///< Forgets releases. Threads released already still pass.
