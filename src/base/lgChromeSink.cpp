@@ -57,47 +57,53 @@ std::string LgChromeSink::getName() const {
 }
 
 /// What every event begins with; the caller goes on with a comma or a brace.
-void LgChromeSink::appendHead(const char* phase, const LgThread& thread) {
-    _events += formatText("%s\n{\"ph\":\"%s\",\"pid\":%llu,\"tid\":%llu", _isFirst ? "" : ",",
-                          phase, static_cast<unsigned long long>(LgSystem::getProcessId()),
-                          static_cast<unsigned long long>(thread.number));
-    _isFirst = false;
+std::string LgChromeSink::makeHead(const char* phase, const LgThread& thread) {
+    return formatText("{\"ph\":\"%s\",\"pid\":%llu,\"tid\":%llu", phase,
+                      static_cast<unsigned long long>(LgSystem::getProcessId()),
+                      static_cast<unsigned long long>(thread.number));
 }
 
-void LgChromeSink::appendThreadName(const LgThread& thread) {
-    appendHead("M", thread);
-    _events += ",\"name\":\"thread_name\",\"args\":{\"name\":";
-    appendJsonText(_events,
+/// Adds a whole event, or nothing if there is no memory for it.
+void LgChromeSink::addEvent(std::string_view event) {
+    const bool isFirst = _events.empty() && _end == static_cast<std::int64_t>(OPENING.size());
+    _events.reserve(_events.size() + event.size() + 2);
+    _events.append(isFirst ? "\n" : ",\n").append(event);
+}
+
+void LgChromeSink::addThreadName(const LgThread& thread) {
+    std::string event = makeHead("M", thread) + ",\"name\":\"thread_name\",\"args\":{\"name\":";
+    appendJsonText(event,
                    thread.name.empty() ? "thread " + std::to_string(thread.osId) : thread.name);
-    _events += "}}";
+    addEvent(event + "}}");
+    _namedThreads.insert(thread.number);
 }
 
 void LgChromeSink::write(const LgRecord& record, const LgThread& thread) {
     using Kind = LgRecord::Kind;
-    if (_namedThreads.insert(thread.number).second || record.kind == Kind::THREAD_NAME) {
-        appendThreadName(thread);
+    if (!_namedThreads.contains(thread.number) || record.kind == Kind::THREAD_NAME) {
+        addThreadName(thread);
     }
     if (record.kind == Kind::THREAD_NAME) return;
 
-    appendHead(phaseOf(record.kind), thread);
+    std::string event = makeHead(phaseOf(record.kind), thread);
     const auto nanoseconds = static_cast<long long>(record.nanoseconds);
-    _events += formatText(",\"ts\":%lld.%03lld", nanoseconds / 1000, nanoseconds % 1000);
+    event += formatText(",\"ts\":%lld.%03lld", nanoseconds / 1000, nanoseconds % 1000);
     if (record.kind != Kind::SPAN_END) {
-        _events += ",\"cat\":";
-        appendJsonText(_events, record.category);
-        _events += ",\"name\":";
-        appendJsonText(_events, record.text);
+        event += ",\"cat\":";
+        appendJsonText(event, record.category);
+        event += ",\"name\":";
+        appendJsonText(event, record.text);
     }
-    if (record.kind == Kind::LINE || record.kind == Kind::INSTANT) _events += ",\"s\":\"t\"";
+    if (record.kind == Kind::LINE || record.kind == Kind::INSTANT) event += ",\"s\":\"t\"";
     if (record.kind == Kind::ASYNC_BEGIN || record.kind == Kind::ASYNC_END) {
-        _events += formatText(",\"id\":\"0x%llx\"", static_cast<unsigned long long>(record.id));
+        event += formatText(",\"id\":\"0x%llx\"", static_cast<unsigned long long>(record.id));
     }
     if (record.kind == Kind::COUNTER) {
         const std::string value =
             std::isfinite(record.value) ? formatText("%.17g", record.value) : "null";
-        _events += ",\"args\":{\"value\":" + value + "}";
+        event += ",\"args\":{\"value\":" + value + "}";
     }
-    _events += '}';
+    addEvent(event + '}');
 }
 
 void LgChromeSink::flush() {
@@ -115,6 +121,7 @@ void LgChromeSink::writeAtEnd(std::string_view text) {
         return;
     }
     _file->writeAt(_end, CLOSING);
+    _namedThreads.clear();  // some of the names may be among what is lost
     _file->truncate(_end + static_cast<std::int64_t>(CLOSING.size()));
     throw ExSysError(ORV_FILE, __LINE__, ("write to " + _name).c_str(), error);
 }

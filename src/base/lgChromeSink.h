@@ -29,16 +29,16 @@ public:
 private:
     class File;
 
-    void appendHead(const char* phase, const LgThread& thread);
-    void appendThreadName(const LgThread& thread);
+    static std::string makeHead(const char* phase, const LgThread& thread);
+    void addEvent(std::string_view event);
+    void addThreadName(const LgThread& thread);
     void writeAtEnd(std::string_view text);
 
     std::unique_ptr<File> _file;  // never null
     std::string _name;
-    std::string _events;   // not written yet
-    std::int64_t _end;     // bytes in the file, without the closing brackets
-    bool _isFirst = true;  // no event was made yet, so that none has a comma before
-    std::set<std::uint64_t> _namedThreads;  // that have not ended
+    std::string _events;                    // not written yet
+    std::int64_t _end;                      // bytes in the file, without the closing brackets
+    std::set<std::uint64_t> _namedThreads;  // in the file, and not ended
 };
 
 }  // namespace Orv

@@ -45,11 +45,12 @@ void appendLines(std::string& lines, std::string_view text) {
 
 void LgTextSink::write(const LgRecord& record, const LgThread& thread) {
     if (record.kind != LgRecord::Kind::LINE) return;
-    _lines += formatText("%s %s %s [", secondsOf(record.nanoseconds).c_str(),
-                         nameOf(record.severity), record.category);
-    _lines += thread.name.empty() ? std::to_string(thread.osId) : thread.name;
-    _lines += "] ";
-    appendLines(_lines, record.text);
+    std::string line = formatText("%s %s %s [", secondsOf(record.nanoseconds).c_str(),
+                                  nameOf(record.severity), record.category);
+    line += thread.name.empty() ? std::to_string(thread.osId) : thread.name;
+    line += "] ";
+    appendLines(line, record.text);
+    _lines += line;
 }
 
 void LgTextSink::flush() {

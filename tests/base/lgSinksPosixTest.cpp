@@ -54,6 +54,40 @@ TEST_F(LgSinksPosixTest, aParserTakesTheTraceOfManyThreadsAndEveryByte) {
     EXPECT_TRUE(isChromeTrace(file.getPath(), 4 * 256 + 4));
 }
 
+/// For its life no file of the process can grow beyond that many bytes, as on a full disk.
+class FullDisk {
+public:
+    explicit FullDisk(rlim_t nbBytes) : _oldHandler(std::signal(SIGXFSZ, SIG_IGN)) {
+        EXPECT_EQ(::getrlimit(RLIMIT_FSIZE, &_old), 0);
+        const rlimit small{nbBytes, _old.rlim_max};
+        EXPECT_EQ(::setrlimit(RLIMIT_FSIZE, &small), 0);
+    }
+
+    ~FullDisk() {
+        EXPECT_EQ(::setrlimit(RLIMIT_FSIZE, &_old), 0);
+        std::signal(SIGXFSZ, _oldHandler);
+    }
+
+private:
+    void (*_oldHandler)(int);
+    rlimit _old{};
+};
+
+TEST_F(LgSinksPosixTest, aTraceWhoseFirstEventsFoundNoRoomIsValidWhenThereIsSome) {
+    const LgTestFile file;
+    const auto json = std::make_shared<LgChromeSink>(file.getPath());
+    registry.addSink(json);
+    {
+        const FullDisk disk(60);
+        LgLog::instant("test", "lost");
+        EXPECT_TRUE(isChromeTrace(file.getPath(), 0));
+    }
+    LgLog::instant("test", "kept");
+    registry.removeSink(*json);
+    EXPECT_TRUE(isChromeTrace(file.getPath(), 2)) << "the thread's name and an event";
+    EXPECT_EQ(file.read().find("lost"), std::string::npos);
+}
+
 TEST_F(LgSinksPosixTest, aFullDiskIsReportedOnceAndTheTraceStaysValid) {
     const LgTestFile textFile;
     const LgTestFile jsonFile;
@@ -63,15 +97,10 @@ TEST_F(LgSinksPosixTest, aFullDiskIsReportedOnceAndTheTraceStaysValid) {
     registry.addSink(text);
     registry.addSink(json);
 
-    // The limit on the size of files stands for the disk's end.
-    rlimit whole{};
-    ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &whole), 0);
-    const auto oldHandler = std::signal(SIGXFSZ, SIG_IGN);
-    const rlimit small{2000, whole.rlim_max};
-    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &small), 0);
-    for (int i = 0; i < 100; ++i) LgLog::line(LgSeverity::INFO, "test", "fills the disk");
-    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &whole), 0);
-    std::signal(SIGXFSZ, oldHandler);
+    {
+        const FullDisk disk(2000);
+        for (int i = 0; i < 100; ++i) LgLog::line(LgSeverity::INFO, "test", "fills the disk");
+    }
     EXPECT_TRUE(isChromeTrace(jsonFile.getPath(), 5));
     LgLog::line(LgSeverity::INFO, "test", "there is room again");
 
