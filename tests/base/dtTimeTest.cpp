@@ -43,6 +43,8 @@ TEST(DtTimeIndex, refusesCountsBeyondItsRangeAndKeepsTheOld) {
     EXPECT_EQ(last, DtTimeIndex(MAX));
     EXPECT_EQ(first, DtTimeIndex(MIN));
     EXPECT_EQ(last + first, DtTimeIndex(-1));
+    EXPECT_EQ(--last, DtTimeIndex(MAX - 1));
+    EXPECT_EQ(++last - 7, DtTimeIndex(MAX - 7));
     std::ostringstream text;
     text << first << ' ' << DtTimeIndex(25);
     EXPECT_EQ(text.str(), "-9223372036854775808 25");
