@@ -1,5 +1,6 @@
 #include "liString.h"
 
+#include <emmintrin.h>  // SSE2, which every processor of the supported platforms has
 #include <istream>
 #include <locale>
 #include <ostream>
@@ -15,27 +16,20 @@ constexpr std::uint32_t powerOf5(int exponent) {
     return exponent == 0 ? 1 : 5 * powerOf5(exponent - 1);
 }
 
-constexpr std::uint64_t repeat8(std::uint64_t byte) {
-    return byte * 0x0101010101010101U;
+// The hashes of sixteen characters, those of the first eight in the lower half and those of the
+// last eight in the upper. Neighbours are joined to pairs, pairs to fours and these to eights, all
+// signed.
+std::uint64_t hashEights(__m128i characters) {
+    const __m128i by5 = _mm_set1_epi32(1 << 16 | powerOf5(1));
+    const __m128i by25 = _mm_set1_epi32(1 << 16 | powerOf5(2));
+    const __m128i by625 = _mm_set1_epi32(1 << 16 | powerOf5(4));
+    const __m128i first = _mm_srai_epi16(_mm_unpacklo_epi8(characters, characters), 8);
+    const __m128i last = _mm_srai_epi16(_mm_unpackhi_epi8(characters, characters), 8);
+    const __m128i pairs = _mm_packs_epi32(_mm_madd_epi16(first, by5), _mm_madd_epi16(last, by5));
+    const __m128i fours = _mm_madd_epi16(pairs, by25);  // at most 128 * 156, so 16 bits hold them
+    const __m128i eights = _mm_madd_epi16(_mm_packs_epi32(fours, fours), by625);
+    return static_cast<std::uint64_t>(_mm_cvtsi128_si64(eights));
 }
-
-// The hash of eight characters, the first one in the lowest byte.
-constexpr std::uint32_t hash8(std::uint64_t bytes) {
-    // Unsigned bytes of 128 more than the signed ones keep the sums from borrowing.
-    constexpr std::uint32_t EXCESS = 128 * ((powerOf5(8) - 1) / 4);
-    bytes ^= repeat8(0x80);
-    // Four pairs of neighbours at once, each in 16 bits: p0 p1 p2 p3, the first one lowest.
-    const std::uint64_t pairs =
-        (bytes & 0x00FF00FF00FF00FFU) * 5 + ((bytes >> 8) & 0x00FF00FF00FF00FFU);
-    // The upper halves of the products are p0 * 5^6 + p2 * 5^2 and p1 * 5^4 + p3.
-    constexpr std::uint64_t EVEN = std::uint64_t{powerOf5(6)} << 32 | powerOf5(2);
-    constexpr std::uint64_t ODD = std::uint64_t{powerOf5(4)} << 32 | powerOf5(0);
-    const std::uint64_t sums =
-        (pairs & 0x0000FFFF0000FFFFU) * EVEN + ((pairs >> 16) & 0x0000FFFF0000FFFFU) * ODD;
-    return static_cast<std::uint32_t>(sums >> 32) - EXCESS;
-}
-
-static_assert(hash8(repeat8(0x00)) == 0 && hash8(std::uint64_t{'a'} << 56) == 'a');
 
 }  // namespace
 
@@ -134,10 +128,19 @@ std::uint64_t LiString::hash() const {
     const char* next = text.data();
     const char* const end = next + text.size();
     std::uint32_t result = 0;
-    for (; end - next >= 8; next += 8) {
-        std::uint64_t bytes = 0;
-        std::memcpy(&bytes, next, 8);
-        result = result * powerOf5(8) + hash8(bytes);
+    for (; end - next >= 16; next += 16) {
+        __m128i characters;
+        std::memcpy(&characters, next, 16);
+        const std::uint64_t eights = hashEights(characters);
+        result = result * powerOf5(16) + static_cast<std::uint32_t>(eights) * powerOf5(8) +
+                 static_cast<std::uint32_t>(eights >> 32);
+    }
+    if (end - next >= 8) {
+        std::int64_t characters = 0;
+        std::memcpy(&characters, next, 8);
+        const std::uint64_t eights = hashEights(_mm_cvtsi64_si128(characters));
+        result = result * powerOf5(8) + static_cast<std::uint32_t>(eights);
+        next += 8;
     }
     for (; next != end; ++next) {
         result = result * 5 + static_cast<std::uint32_t>(static_cast<signed char>(*next));
