@@ -1,5 +1,6 @@
 #include "lkFutexPosix.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <sys/syscall.h>
 #include <unistd.h>
@@ -28,8 +29,19 @@ bool LkFutexPosix::lockSlowly(std::uint32_t self, Watch watch) {
         _nbReentries.store(getDepth(), std::memory_order_relaxed);
         return true;
     }
-    return _adaptiveWait.look([&] { return !isHeld() && take(self); }) ||
-           takeBySleeping(self, watch);
+    return takeByLooking(self) || takeBySleeping(self, watch);
+}
+
+/// Each look takes the word away from its owner's processor, so they become rarer.
+bool LkFutexPosix::takeByLooking(std::uint32_t self) noexcept {
+    constexpr unsigned mostPauses = 16;
+    unsigned nbPauses = 1;
+    return _adaptiveWait.look([&] {
+        if (!isHeld() && take(self)) return true;
+        for (unsigned i = 0; i < nbPauses; ++i) __builtin_ia32_pause();
+        nbPauses = std::min(2 * nbPauses, mostPauses);
+        return false;
+    });
 }
 
 /// Takes the lock with the sleepers' bit set, as nobody knows whether others sleep as well: at

@@ -78,6 +78,7 @@ private:
     }
 
     bool lockSlowly(std::uint32_t self, Watch watch);
+    bool takeByLooking(std::uint32_t self) noexcept;
     bool takeBySleeping(std::uint32_t self, Watch watch);
 };
 
