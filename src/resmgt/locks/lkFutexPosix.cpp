@@ -1,35 +1,25 @@
 #include "lkFutexPosix.h"
 
+#include <algorithm>
 #include <cerrno>
-#include <csignal>
-#include <ctime>
-#include <linux/futex.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
-#include "assertions.h"
-#include "lkSpinner.h"
+#include "lkTimeLimit.h"
 
 namespace Orv {
 
 namespace {
 
-constexpr timespec watchPeriod{.tv_sec = 1, .tv_nsec = 0};
-
-/// Keeps the caller's errno: taking a lock is no system call to its user.
-class ErrnoKeeper {
-public:
-    ErrnoKeeper() noexcept : _errno(errno) {}
-    ~ErrnoKeeper() { errno = _errno; }
-    ErrnoKeeper(const ErrnoKeeper&) = delete;
-    ErrnoKeeper& operator=(const ErrnoKeeper&) = delete;
-
-private:
-    const int _errno;
-};
+LkTimeLimit untilNextWatch(LkFutexPosix::Watch watch) {
+    return watch == LkFutexPosix::WATCH_OWNER ? LkTimeLimit(1.0) : LkTimeLimit();
+}
 
 bool hasEnded(std::uint32_t thread) noexcept {
-    return ::syscall(SYS_tgkill, ::getpid(), thread, 0) != 0 && errno == ESRCH;
+    const int kept = errno;  // taking a lock is no system call to its user
+    const bool result = ::syscall(SYS_tgkill, ::getpid(), thread, 0) != 0 && errno == ESRCH;
+    errno = kept;
+    return result;
 }
 
 }  // namespace
@@ -42,33 +32,22 @@ bool LkFutexPosix::lockSlowly(std::uint32_t self, Watch watch) {
     return takeByLooking(self) || takeBySleeping(self, watch);
 }
 
-/// Looks for a while, unless that was in vain lately: each failure doubles the number of later
-/// attempts that go without.
+/// Each look takes the word away from its owner's processor, so they become rarer.
 bool LkFutexPosix::takeByLooking(std::uint32_t self) noexcept {
-    constexpr auto relaxed = std::memory_order_relaxed;
-    constexpr std::uint8_t mostBlind = 63;
-    if (const std::uint8_t left = _nbBlindLeft.load(relaxed)) {
-        _nbBlindLeft.store(static_cast<std::uint8_t>(left - 1), relaxed);
+    constexpr unsigned mostPauses = 16;
+    unsigned nbPauses = 1;
+    return _adaptiveWait.look([&] {
+        if (!isHeld() && take(self)) return true;
+        for (unsigned i = 0; i < nbPauses; ++i) __builtin_ia32_pause();
+        nbPauses = std::min(2 * nbPauses, mostPauses);
         return false;
-    }
-    LkSpinner spinner;
-    while (spinner.pause()) {
-        if (!isHeld() && take(self)) {
-            _nbBlind.store(0, relaxed);
-            return true;
-        }
-    }
-    const auto nbBlind = static_cast<std::uint8_t>((_nbBlind.load(relaxed) * 2 + 1) & mostBlind);
-    _nbBlind.store(nbBlind, relaxed);
-    _nbBlindLeft.store(nbBlind, relaxed);
-    return false;
+    });
 }
 
 /// Takes the lock with the sleepers' bit set, as nobody knows whether others sleep as well: at
 /// worst the next unlock wakes nobody.
 bool LkFutexPosix::takeBySleeping(std::uint32_t self, Watch watch) {
-    const ErrnoKeeper errnoKeeper;
-    const timespec* const timeout = watch == WATCH_OWNER ? &watchPeriod : nullptr;
+    LkTimeLimit limit = untilNextWatch(watch);
     std::uint32_t deadOwner = 0;  // who has ended and held the lock when it was last looked at
     for (;;) {
         std::uint32_t word = _word.load(std::memory_order_relaxed);
@@ -85,21 +64,11 @@ bool LkFutexPosix::takeBySleeping(std::uint32_t self, Watch watch) {
             !_word.compare_exchange_strong(word, owner | SLEEPERS, std::memory_order_relaxed)) {
             continue;
         }
-        if (::syscall(SYS_futex, &_word, FUTEX_WAIT_PRIVATE, owner | SLEEPERS, timeout) == 0 ||
-            errno == EAGAIN) {
-            continue;
+        if (!LkAddressWaitPosix::wait(&_word, owner | SLEEPERS, limit)) {
+            limit = untilNextWatch(watch);
+            if (hasEnded(owner)) deadOwner = owner;
         }
-        ORV_ASSERT_SYS(errno == EINTR || errno == ETIMEDOUT,
-                       "::syscall( SYS_futex, &_word, FUTEX_WAIT_PRIVATE, word, timeout ) == 0",
-                       errno);
-        if (watch == WATCH_OWNER && hasEnded(owner)) deadOwner = owner;
     }
-}
-
-void LkFutexPosix::wakeOne(Word* word) noexcept {
-    const ErrnoKeeper errnoKeeper;
-    // The word may have gone with its lock by now; the kernel uses no more than its address.
-    ::syscall(SYS_futex, word, FUTEX_WAKE_PRIVATE, 1);
 }
 
 }  // namespace Orv

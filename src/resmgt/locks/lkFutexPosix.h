@@ -3,6 +3,8 @@
 #include <atomic>
 #include <cstdint>
 
+#include "lkAdaptiveWait.h"
+#include "lkAddressWaitPosix.h"
 #include "lkThreadIdPosix.h"
 
 namespace Orv {
@@ -42,8 +44,10 @@ public:
             _nbReentries.store(nbReentries - 1, std::memory_order_relaxed);
             return true;
         }
-        // From here on the object may be gone.
-        if (_word.exchange(0, std::memory_order_release) & SLEEPERS) wakeOne(&_word);
+        // Once the word is 0 the object may be gone: what is left to use is its address.
+        if (_word.exchange(0, std::memory_order_release) & SLEEPERS) {
+            LkAddressWaitPosix::wakeOne(&_word);
+        }
         return true;
     }
 
@@ -61,14 +65,11 @@ public:
     }
 
 private:
-    using Word = std::atomic<std::uint32_t>;
     static constexpr std::uint32_t SLEEPERS = 0x80000000;  // thread ids stay far below
 
-    Word _word{0};
+    std::atomic<std::uint32_t> _word{0};
     std::atomic<int> _nbReentries{0};  // written by the owner
-    // How often not to look, the last time and from now on: guesses, which threads may mix up.
-    std::atomic<std::uint8_t> _nbBlind{0};
-    std::atomic<std::uint8_t> _nbBlindLeft{0};
+    LkAdaptiveWait _adaptiveWait;
 
     bool take(std::uint32_t self) noexcept {
         std::uint32_t free = 0;
@@ -79,7 +80,6 @@ private:
     bool lockSlowly(std::uint32_t self, Watch watch);
     bool takeByLooking(std::uint32_t self) noexcept;
     bool takeBySleeping(std::uint32_t self, Watch watch);
-    static void wakeOne(Word* word) noexcept;
 };
 
 }  // namespace Orv

@@ -4,8 +4,8 @@
 #include <ostream>
 
 #include "assertions.h"
+#include "lkAdaptiveWait.h"
 #include "lkEx.h"
-#include "lkSpinner.h"
 
 namespace Orv {
 
@@ -13,10 +13,10 @@ bool LkMutexPosix::spinLock(unsigned tries) {
     if (_futex.isHeldByCaller()) {
         throw LkEx::ExDeadLock(ORV_FILE, __LINE__, "LkMutexPosix", _name, 0, "self deadlock");
     }
-    LkSpinner spinner;
-    do {
-        if (_futex.tryLock()) return true;
-    } while (--tries != 0 && spinner.pause());  // 0 tries wrap around to very many
+    LkAdaptiveWait::Look look;
+    do {  // 0 tries wrap around to very many
+        if (!_futex.isHeld() && _futex.tryLock()) return true;
+    } while (--tries != 0 && LkAdaptiveWait::mayLook() && look.goesOn());
     return lock();
 }
 

@@ -3,8 +3,8 @@
 #include <ostream>
 
 #include "assertions.h"
+#include "lkAdaptiveWait.h"
 #include "lkEx.h"
-#include "lkSpinner.h"
 
 namespace Orv {
 
@@ -47,10 +47,10 @@ bool LkMutexWindows::spinLock(unsigned tries) {
     if (isHeldByCaller()) {
         throw LkEx::ExDeadLock(ORV_FILE, __LINE__, "LkMutexWindows", _name, 0, "self deadlock");
     }
-    LkSpinner spinner;
-    do {
+    LkAdaptiveWait::Look look;
+    do {  // 0 tries wrap around to very many
         if (!isLocked() && tryLock()) return true;
-    } while (--tries != 0 && spinner.pause());  // 0 tries wrap around to very many
+    } while (--tries != 0 && LkAdaptiveWait::mayLook() && look.goesOn());
     return lock();
 }
 
