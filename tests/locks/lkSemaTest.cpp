@@ -143,8 +143,9 @@ private:
     std::atomic<int>* _nbRight = nullptr;
 };
 
+thread_local LastWait lastWait;
+
 TEST(LkSema, canBeWaitedForInTheLastDestructorsOfAThread) {
-    static thread_local LastWait lastWait;
     std::atomic<int> nbRight{0};
     onThreads(8, [&](int) {
         lastWait.begin(nbRight);  // made before the thread's first wait, so destroyed after
