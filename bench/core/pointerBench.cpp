@@ -1,12 +1,10 @@
 // RCShdPtr beside the counted pointers of Boost, the standard library and Qt: one copy, which goes
 // again. The objects live as long as the process.
-#include <benchmark/benchmark.h>
-
 #include <QExplicitlySharedDataPointer>
+#include <benchmark/benchmark.h>
 #include <boost/smart_ptr/intrusive_ptr.hpp>
 #include <boost/smart_ptr/intrusive_ref_counter.hpp>
 #include <memory>
-
 #include <orv/rcShdPtr.h>
 
 namespace {

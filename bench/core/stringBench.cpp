@@ -1,13 +1,11 @@
 // LiString beside the strings of the standard library, Qt and Abseil.
+#include <QByteArray>
+#include <QHash>
 #include <absl/hash/hash.h>
 #include <absl/strings/str_cat.h>
 #include <benchmark/benchmark.h>
-
-#include <QByteArray>
-#include <QHash>
-#include <string>
-
 #include <orv/liString.h>
+#include <string>
 
 namespace {
 
@@ -17,13 +15,25 @@ constexpr char TEXT_24[] = "device.property.valueXYZ";
 constexpr char HAYSTACK_64[] = "the quick brown fox jumps over a lazy dog while needle is late..";
 static_assert(sizeof TEXT_24 == 25 && sizeof HAYSTACK_64 == 65);
 
-int find(const LiString& text, const LiString& part) { return text.find(part); }
-std::size_t find(const std::string& text, const std::string& part) { return text.find(part); }
-qsizetype find(const QByteArray& text, const QByteArray& part) { return text.indexOf(part); }
+int find(const LiString& text, const LiString& part) {
+    return text.find(part);
+}
+std::size_t find(const std::string& text, const std::string& part) {
+    return text.find(part);
+}
+qsizetype find(const QByteArray& text, const QByteArray& part) {
+    return text.indexOf(part);
+}
 
-std::size_t hash(const LiString& text) { return text.hash(); }
-std::size_t hash(const std::string& text) { return std::hash<std::string>()(text); }
-std::size_t hash(const QByteArray& text) { return qHash(text); }
+std::size_t hash(const LiString& text) {
+    return text.hash();
+}
+std::size_t hash(const std::string& text) {
+    return std::hash<std::string>()(text);
+}
+std::size_t hash(const QByteArray& text) {
+    return qHash(text);
+}
 
 template <class String>
 void copy(benchmark::State& state) {

@@ -42,7 +42,7 @@ namespace {
 constexpr int MOST_ROUNDS = 8;
 
 constexpr milliseconds LONGEST_FLUSH(1000);
-constexpr milliseconds LONGEST_FLUSH_AT_EXIT(250);
+constexpr milliseconds LONGEST_FLUSH_AT_EXIT(250);  // for a reader that is at the last lines
 constexpr milliseconds READER_PATIENCE(100);
 
 }  // namespace
@@ -209,8 +209,8 @@ bool LgRegistry::flushWithin(milliseconds limit) noexcept {
 }
 
 void LgRegistry::drainAtExit() noexcept {
-    _isExiting.store(true, std::memory_order_relaxed);
-    flushWithin(LONGEST_FLUSH_AT_EXIT);
+    const bool isFirst = !_isExiting.exchange(true, std::memory_order_relaxed);
+    flushWithin(isFirst ? LONGEST_FLUSH_AT_EXIT : milliseconds(0));
 }
 
 // Sinks

@@ -30,7 +30,8 @@ std::optional<std::int64_t> countToMinute(const OsDateTypes::DateStruct& fields)
                                           std::chrono::month(static_cast<unsigned>(fields.month)),
                                           std::chrono::day(static_cast<unsigned>(fields.day)));
     if (!day.ok()) return std::nullopt;
-    return Seconds(Days(day).time_since_epoch()).count() + fields.hour * 3600 + fields.minute * 60;
+    return Seconds(Days(day).time_since_epoch()).count() + std::int64_t{3600} * fields.hour +
+           std::int64_t{60} * fields.minute;
 }
 
 }  // namespace
@@ -58,12 +59,12 @@ std::optional<OsDateTypes::DateRep> OsDateUtil::makeTime(const DateStruct& field
 std::optional<std::int64_t> OsDateUtil::localToUtc(std::int64_t localSeconds,
                                                    std::optional<int> preferredOffset) {
     constexpr std::int64_t DAY = 86400;
-    const int before = findLocalZone(localSeconds - DAY).offsetSeconds;
-    const int after = findLocalZone(localSeconds + DAY).offsetSeconds;
-    // Where the zone changed twice within two days, the offset between the changes.
-    const int between = findLocalZone(localSeconds - before).offsetSeconds;
     std::optional<std::int64_t> first;
-    for (const int offset : {before, after, between}) {
+    std::optional<int> triedOffset;
+    for (const std::int64_t distance : {-DAY, DAY}) {
+        const int offset = findLocalZone(localSeconds + distance).offsetSeconds;
+        if (offset == triedOffset) break;
+        triedOffset = offset;
         const std::int64_t utcSeconds = localSeconds - offset;
         if (findLocalZone(utcSeconds).offsetSeconds != offset) continue;
         if (offset == preferredOffset) return utcSeconds;
@@ -122,6 +123,7 @@ double OsDateUtil::getDifference(const DateRep& later, const DateRep& earlier) n
 
 std::optional<std::size_t> OsDateUtil::format(char* text, std::size_t size, const char* format,
                                               const DateRep& date, TimeMode mode) {
+    ORV_ASSERT(text != nullptr && format != nullptr);
     ORV_ASSERT_TEXT(isInRange(date), "the date lies in the years 1 to 9999");
     Zone zone;
     if (mode == TimeMode::LOCAL) {

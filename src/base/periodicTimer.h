@@ -6,7 +6,6 @@
 
 #include "baseApi.h"
 #include "dtTimeMark.h"
-#include "threadSafety.h"
 
 namespace Orv {
 

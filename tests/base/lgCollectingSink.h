@@ -3,6 +3,7 @@
 #include <condition_variable>
 #include <mutex>
 
+#include "gate.h"
 #include "lgRegistry.h"
 #include "lgSink.h"
 
@@ -79,32 +80,15 @@ private:
     bool _isAdded = false;
 };
 
-/// Holds up whoever comes until it is opened.
-class LgTestGate {
-public:
+/// Holds up a sink until it is opened.
+struct LgTestGate {
+    TestCounter reached;
+    Gate opened;
+
     void pass() {
-        std::unique_lock guard(_mutex);
-        ++_nbWaiting;
-        _changed.notify_all();
-        _changed.wait(guard, [this] { return _isOpen; });
+        reached.add();
+        opened.wait();
     }
-
-    void waitUntilReached() {
-        std::unique_lock guard(_mutex);
-        _changed.wait(guard, [this] { return _nbWaiting > 0; });
-    }
-
-    void open() {
-        const std::lock_guard guard(_mutex);
-        _isOpen = true;
-        _changed.notify_all();
-    }
-
-private:
-    std::mutex _mutex;
-    std::condition_variable _changed;
-    int _nbWaiting = 0;
-    bool _isOpen = false;
 };
 
 }  // namespace Orv

@@ -61,7 +61,7 @@ TEST_F(LgExitDeathTest, aSinkThatHangsHoldsUpNoExit) {
         TraceManager::getInstance().addSink(sink);
         leaveReaderRunning();
         std::thread([] { say("stuck"); }).detach();
-        gate.waitUntilReached();
+        gate.reached.waitFor(1);
         say("never written");
         std::exit(5);
     };

@@ -45,6 +45,7 @@ protected:
 TEST_F(LgReaderTest, isWokenByEveryRecordThatItHasNotSeen) {
     addSink();
     const RunningReader reader;
+    waitForReader();
     for (int i = 0; i < 3000; ++i) {
         log("ping");
         sink->waitFor(1);  // a wake-up that got lost would hang here
@@ -55,6 +56,7 @@ TEST_F(LgReaderTest, isWokenByEveryRecordThatItHasNotSeen) {
 TEST_F(LgReaderTest, writesTheRecordsOfManyThreadsInTimeOrder) {
     addSink();
     const RunningReader reader;
+    waitForReader();
     constexpr std::size_t NB_THREADS = 8;
     constexpr std::size_t NB_EACH = LgQueue::CAPACITY;
     for (int round = 0; round < 20; ++round) {
@@ -83,10 +85,10 @@ TEST_F(LgReaderTest, keepsLoggingThreadsFromWaitingForASink) {
     const RunningReader reader;
     waitForReader();
     log("stop here");
-    gate.waitUntilReached();
+    gate.reached.waitFor(1);
     // One record is being written and still has its place; so the last hundred find none.
     for (std::size_t i = 1; i < LgQueue::CAPACITY + 100; ++i) log("unhindered");
-    gate.open();
+    gate.opened.open();
     sink->waitFor(LgQueue::CAPACITY + 1);
     const auto entries = sink->take();
     ASSERT_EQ(entries.size(), LgQueue::CAPACITY + 1);

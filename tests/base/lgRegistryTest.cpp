@@ -63,10 +63,10 @@ TEST_F(LgRegistryTest, aThreadHeldUpByASinkKeepsNoOtherFromLoggingAndWritesForIt
     };
     addSink();
     std::jthread slow([] { log("slow"); });
-    gate.waitUntilReached();
+    gate.reached.waitFor(1);
     log("meanwhile");  // returns, though the sink is held up
     EXPECT_EQ(sink->takeTexts(), Texts{});
-    gate.open();
+    gate.opened.open();
     slow.join();
     EXPECT_EQ(sink->takeTexts(), (Texts{"slow", "meanwhile"}));
 }
@@ -78,9 +78,9 @@ TEST_F(LgRegistryTest, reportsHowManyMessagesAFullQueueHasLost) {
     };
     addSink();
     std::jthread slow([] { log("slow"); });
-    gate.waitUntilReached();
+    gate.reached.waitFor(1);
     for (std::size_t i = 0; i < LgQueue::CAPACITY + 100; ++i) log("fast");
-    gate.open();
+    gate.opened.open();
     slow.join();
     ASSERT_TRUE(registry.flush());
     const Texts texts = sink->takeTexts();
@@ -98,12 +98,12 @@ TEST_F(LgRegistryTest, aQueueGoesWhenItsThreadHasEndedAndItIsWritten) {
     log("before");
     const std::size_t nbBefore = registry.getNbQueues();
     std::jthread slow([] { log("slow"); });
-    gate.waitUntilReached();
+    gate.reached.waitFor(1);
     std::jthread([] {
         for (int i = 0; i < 10; ++i) log("left behind");
     }).join();
     EXPECT_EQ(registry.getNbQueues(), nbBefore + 2);
-    gate.open();
+    gate.opened.open();
     slow.join();
     ASSERT_TRUE(registry.flush());
     EXPECT_EQ(registry.getNbQueues(), nbBefore);

@@ -99,28 +99,26 @@ TYPED_TEST(AnyLock, refusesToBeReleasedByAThreadThatDoesNotHoldIt) {
 
 TYPED_TEST(AnyLock, mayBeDestroyedByWhoeverWaitedForItWhileItsUnlockStillRuns) {
     constexpr int nbRounds = 3000;
-    std::atomic<TypeParam*> next{nullptr};
-    std::atomic<int> nbTaken{0};
+    TypeParam* next = nullptr;
+    TestCounter nbOffered;
+    TestCounter nbTaken;
     std::jthread holder([&] {
-        for (int round = 0; round < nbRounds; ++round) {
-            next.wait(nullptr);
-            TypeParam& lock = *next.exchange(nullptr);
-            whileHolding(lock, [&] {
-                ++nbTaken;
-                nbTaken.notify_one();
+        for (int round = 1; round <= nbRounds && nbOffered.waitFor(round); ++round) {
+            whileHolding(*next, [&] {
+                nbTaken.add();
                 // Let the other fall asleep now and then; else it is still looking.
                 if (round % 16 == 0) std::this_thread::sleep_for(std::chrono::microseconds(200));
             });
         }
     });
-    for (int round = 0; round < nbRounds; ++round) {
+    for (int round = 1; round <= nbRounds; ++round) {
         const auto lock = std::make_unique<TypeParam>("mortal");
         next = lock.get();
-        next.notify_one();
-        nbTaken.wait(round);
+        nbOffered.add();
+        if (!nbTaken.waitFor(round)) break;
         whileHolding(*lock, [] {});
     }
-    EXPECT_EQ(nbTaken, nbRounds);
+    EXPECT_EQ(nbTaken.get(), nbRounds);
 }
 
 TEST(LkLock, printsItself) {

@@ -33,7 +33,11 @@ public:
 
 private:
     friend class LkSingleton<Counted>;
-    Counted() : content(++nbMade * 1000) {}
+    Counted() {
+        // Time for the others to come as far as they get before there is an instance.
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+        content = ++nbMade * 1000;
+    }
 };
 
 TEST(LkSingleton, isMadeOnceForAllThreadsThatAskAtTheSameTime) {
@@ -122,16 +126,22 @@ TEST(LkMutexAttr, hasOneDefaultForAllThreadsThatAskAtTheSameTime) {
 
 TEST(LkNamedMutex, excludesByNameAndGoesWithItsLastUser) {
     long count = 0;
+    bool isInside = false;
+    int nbMeetings = 0;
     LkNamedMutexNative other("orv test: other");
     const LkGuard<LkNamedMutexNative> guard(other);
     onManyThreads([&](int) {
         for (int round = 0; round < 50; ++round) {
             LkNamedMutexNative mutex("orv test: one");
             const LkGuard<LkNamedMutexNative> inside(mutex);
+            if (std::exchange(isInside, true)) ++nbMeetings;
             ++count;
+            std::this_thread::yield();
+            isInside = false;
         }
     });
     EXPECT_EQ(count, nbThreads * 50);
+    EXPECT_EQ(nbMeetings, 0);
 }
 
 /// Writes down its end; the first to be made is asked for by the last one.

@@ -37,7 +37,7 @@ void release(Guard& guard) ORV_NO_THREAD_SAFETY_ANALYSIS {
 
 /// Takes the lock for ever: no destructor will give it back.
 template <class Lock>
-void takeForEver(Lock& lock) {
+void takeForEver(Lock& lock) ORV_NO_THREAD_SAFETY_ANALYSIS {
     alignas(GuardOf<Lock>) std::byte room[sizeof(GuardOf<Lock>)];
     new (room) GuardOf<Lock>(lock);
 }

@@ -178,8 +178,7 @@ TEST(PriorityUpdate, destructionWaitsWhileAnotherThreadTells) {
         std::this_thread::sleep_for(std::chrono::milliseconds(20));
         hasLeft = true;
     });
-    static_cast<void>(told->isFixed());
-    told->setPriority(5);
+    told->setPriority(5);  // a use, so that other threads may tell it
     std::thread teller([&] { mgr.update(); });
     isInside.wait();
     // What changes meanwhile, is told by the same thread afterwards; nobody waits for it.

@@ -38,7 +38,12 @@ struct SolverProblem {
     Numbers pack(const std::vector<Numbers>& solutions) const;
 
 private:
+    using MaybeNumbers = std::vector<std::optional<int>>;
+
     std::vector<std::vector<bool>> findWhoIsBelow() const;
+    static std::optional<int> findExtreme(std::size_t priority, bool isHighest,
+                                          const MaybeNumbers& numbered,
+                                          const std::vector<Numbers>& solutions);
     void tryNumbers(Numbers&, std::vector<Numbers>& found) const;
 };
 
@@ -111,26 +116,26 @@ inline std::vector<std::vector<bool>> SolverProblem::findWhoIsBelow() const {
     return isBelow;
 }
 
+/// The extreme number that a priority has in any solution that agrees with what is numbered.
+inline std::optional<int> SolverProblem::findExtreme(std::size_t priority, bool isHighest,
+                                                     const MaybeNumbers& numbered,
+                                                     const std::vector<Numbers>& solutions) {
+    std::optional<int> extreme;
+    for (const Numbers& solution : solutions) {
+        const auto agrees = [](std::optional<int> known, int number) {
+            return known.value_or(number) == number;
+        };
+        if (!std::equal(numbered.begin(), numbered.end(), solution.begin(), agrees)) continue;
+        const int number = solution[priority];
+        if (!extreme || (isHighest ? number > *extreme : number < *extreme)) extreme = number;
+    }
+    return extreme;
+}
+
 inline SolverProblem::Numbers SolverProblem::pack(const std::vector<Numbers>& solutions) const {
     const auto isBelow = findWhoIsBelow();
-    std::vector<std::optional<int>> numbered = priorities;
+    MaybeNumbers numbered = priorities;
 
-    const auto isPossible = [&](const Numbers& solution) {
-        for (std::size_t i = 0; i < numbered.size(); ++i) {
-            if (numbered[i].value_or(solution[i]) != solution[i]) return false;
-        }
-        return true;
-    };
-    // The extreme number that a priority has in any solution that is still possible.
-    const auto findExtreme = [&](std::size_t priority, bool isHighest) {
-        std::optional<int> extreme;
-        for (const Numbers& solution : solutions) {
-            if (!isPossible(solution)) continue;
-            const int number = solution[priority];
-            if (!extreme || (isHighest ? number > *extreme : number < *extreme)) extreme = number;
-        }
-        return extreme;
-    };
     const auto numberAll = [&](bool isDown) {
         auto next = numbered;
         for (std::size_t i = 0; i < numbered.size(); ++i) {
@@ -138,7 +143,7 @@ inline SolverProblem::Numbers SolverProblem::pack(const std::vector<Numbers>& so
             for (std::size_t j = 0; j < numbered.size(); ++j) {
                 if (numbered[j] && (isDown ? isBelow[i][j] : isBelow[j][i])) isConcerned = true;
             }
-            if (isConcerned && !numbered[i]) next[i] = findExtreme(i, isDown);
+            if (isConcerned && !numbered[i]) next[i] = findExtreme(i, isDown, numbered, solutions);
         }
         const bool isNew = next != numbered;
         numbered = next;
@@ -151,7 +156,7 @@ inline SolverProblem::Numbers SolverProblem::pack(const std::vector<Numbers>& so
     }
     Numbers result;
     for (std::size_t i = 0; i < numbered.size(); ++i) {
-        result.push_back(numbered[i] ? *numbered[i] : *findExtreme(i, false));
+        result.push_back(numbered[i] ? *numbered[i] : *findExtreme(i, false, numbered, solutions));
     }
     return result;
 }

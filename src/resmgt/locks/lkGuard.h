@@ -16,8 +16,8 @@ enum LkSpinTag { SPIN };  ///< For LkGuard: look a number of times before sleepi
 /// with one way to hold them; left out, it is the const one.
 ///
 /// - Threads: one guard is used by one thread, and destroyed by the one that made it.
-/// - Errors: what the lock's own operations throw. The destructor traces it while the stack
-/// unwinds.
+/// - Errors: what the lock's own operations throw; while the stack unwinds the destructor traces
+/// it.
 template <class T>
 class [[nodiscard]] ORV_SCOPED_CAPABILITY LkGuard {
 public:

@@ -10,7 +10,7 @@ namespace Orv {
 class ORV_RESMGT_API LkMutexAttrTypes {
 public:
     /// What happens to the priority of a thread that holds a mutex.
-    enum PrioProtocol {
+    enum PrioProtocol : int {
         UNIMPLEMENTED = 0,  ///< Whatever the system does.
         NONE = 1,           ///< Nothing.
         INHERIT = 2,        ///< It rises to that of the most urgent waiter.

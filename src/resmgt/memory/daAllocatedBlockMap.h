@@ -14,9 +14,10 @@ namespace Orv {
 /// the number of blocks. It grows in reserve() alone and never shrinks.
 ///
 /// - Threads: the caller's lock.
+template <class Word>
 class DaAllocatedBlockMap {
 public:
-    DaAllocatedBlockMap() = default;
+    using Block = DaBlock<Word>;
 
     /// Makes sure that the map can hold @p nbBlocks without asking for memory.
     /// @throws std::bad_alloc, the map being unchanged.
@@ -24,24 +25,35 @@ public:
         if (nbBlocks > _nbBlocksMax) grow(nbBlocks);
     }
 
-    /// Adds a block whose address is not in the map and not 0; there must be room, see reserve().
-    void insert(DaBlock block) noexcept;
+    /// Adds a block whose address is not in the map; there must be room, see reserve().
+    void insert(Block block) noexcept;
 
     /// Takes the block at @p address out of the map.
     /// @return its length, or 0 if there is no such block.
-    [[nodiscard]] std::uint64_t remove(std::uint64_t address) noexcept;
+    [[nodiscard]] Word remove(Word address) noexcept;
+
+    /// Starts to bring the block at @p address near, for a remove() that follows.
+    void prefetch(Word address) const noexcept {
+        if (!_slots.empty()) __builtin_prefetch(&_slots[homeOf(address)], 1);
+    }
 
     std::size_t getNbBlocks() const noexcept { return _nbBlocks; }
 
 private:
-    std::vector<DaBlock> _slots;  // empty, or a power of two of them; address 0 marks a free one
+    std::vector<Block> _slots;  // none, or a power of two of them; length 0 marks a free one
     std::size_t _nbBlocks = 0;
     std::size_t _nbBlocksMax = 0;  // grows before there are more
     unsigned _shift = 0;           // from a hash of 64 bits to a slot
 
     void grow(std::size_t nbBlocks);
-    std::size_t homeOf(std::uint64_t address) const noexcept;
+    std::size_t homeOf(Word address) const noexcept {
+        // Multiplying by 2^64 over the golden ratio spreads addresses that lie in even steps.
+        return static_cast<std::size_t>((address * std::uint64_t(0x9E3779B97F4A7C15)) >> _shift);
+    }
     std::size_t next(std::size_t slot) const noexcept { return (slot + 1) & (_slots.size() - 1); }
 };
+
+extern template class DaAllocatedBlockMap<std::uint32_t>;
+extern template class DaAllocatedBlockMap<std::uint64_t>;
 
 }  // namespace Orv

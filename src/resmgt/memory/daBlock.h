@@ -1,15 +1,12 @@
 #pragma once
 
-#include <cstdint>
-
 namespace Orv {
 
-/// A stretch of memory: where it starts and how many bytes it has.
+/// A stretch of an arena: where it starts and how long it is, in the arena's unit.
+template <class Word>
 struct DaBlock {
-    std::uint64_t address = 0;
-    std::uint64_t length = 0;
-
-    friend bool operator==(const DaBlock&, const DaBlock&) = default;
+    Word address = 0;
+    Word length = 0;
 };
 
 }  // namespace Orv

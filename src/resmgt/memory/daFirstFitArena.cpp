@@ -1,7 +1,6 @@
 #include "daFirstFitArena.h"
 
 #include <algorithm>
-#include <bit>
 #include <limits>
 #include <ostream>
 
@@ -18,107 +17,99 @@ std::uint64_t addressOf(const void* pointer) noexcept {
     return reinterpret_cast<std::uintptr_t>(pointer);
 }
 
+void* pointerTo(std::uint64_t address) noexcept {
+    return reinterpret_cast<void*>(static_cast<std::uintptr_t>(address));
+}
+
 unsigned long long wide(std::uint64_t number) {
     return number;
+}
+
+/// The base as a number, once it is known to be one that an arena can have.
+std::uint64_t checkedBase(const void* base, std::uint64_t size) {
+    ORV_ASSERT(base != nullptr);
+    ORV_ASSERT(size > 0);
+    ORV_ASSERT_TEXT(size - 1 <= std::numeric_limits<std::uint64_t>::max() - addressOf(base),
+                    "base + size <= 2^64");
+    return addressOf(base);
 }
 
 }  // namespace
 
 DaFirstFitArena::DaFirstFitArena(void* base, std::uint64_t size, const char* name)
     : _name(name != nullptr ? name : "<Unnamed arena>"),
-      _base(addressOf(base)),
+      _base(checkedBase(base, size)),
       _size(size),
-      _freeBytes(size) {
-    ORV_ASSERT(base != nullptr);
-    ORV_ASSERT(size > 0);
-    ORV_ASSERT_TEXT(size - 1 <= std::numeric_limits<std::uint64_t>::max() - _base,
-                    "base + size <= 2^64");
-    giveBack({_base, _size});
+      _unit(fitsNarrow(_base, size) ? GRANULE : 1),
+      _ledger(openLedger(_base, size)) {}
+
+bool DaFirstFitArena::fitsNarrow(std::uint64_t base, std::uint64_t size) noexcept {
+    return base % GRANULE == 0 && size % GRANULE == 0 && size / GRANULE < NarrowLedger::NONE;
+}
+
+std::variant<DaFirstFitArena::NarrowLedger, DaFirstFitArena::WideLedger>
+DaFirstFitArena::openLedger(std::uint64_t base, std::uint64_t size) {
+    if (!fitsNarrow(base, size)) return WideLedger(size, base);
+    return NarrowLedger(static_cast<std::uint32_t>(size / GRANULE),
+                        static_cast<std::uint32_t>(base / GRANULE));
 }
 
 void* DaFirstFitArena::allocate(std::uint64_t size, std::uint64_t alignment) {
-    ORV_ASSERT(alignment == 0 || std::has_single_bit(alignment));
+    ORV_ASSERT((alignment & (alignment - 1)) == 0);
     if (size == 0) size = 1;
-    const std::uint64_t length = (size + (GRANULE - 1)) & ~(GRANULE - 1);
-    if (length < size || length > _freeBytes) return nullptr;
+    const std::uint64_t bytes = (size + (GRANULE - 1)) & ~(GRANULE - 1);
+    if (bytes < size || bytes > _size) return nullptr;
+    if (alignment == 0) alignment = 1;
 
-    // Every free block starts where the base is aligned to, up to a granule.
-    if (alignment == 0 || (alignment <= GRANULE && _base % alignment == 0)) alignment = 1;
-    const std::size_t alignmentNb = _freeBlocks.useAlignment(alignment);
-    // Between two free blocks lies an allocated one, so deallocate() will find room for what it
-    // makes free: whoever is short of memory can always give some back.
-    const std::size_t nbAllocatedBlocks = _allocatedBlocks.getNbBlocks() + 1;
-    _allocatedBlocks.reserve(nbAllocatedBlocks);
-    _freeBlocks.reserve(nbAllocatedBlocks + 1);
-
-    DaFreeBlockTree::Position position;
-    if (!_freeBlocks.findFit(length, alignmentNb, position)) return nullptr;
-    const std::uint64_t address = _freeBlocks.at(position).address;
-    const std::uint64_t start = address + ((0 - address) & (alignment - 1));
-    carve(position, {start, length});
-    _allocatedBlocks.insert({start, length});
-    _freeBytes -= length;
-    return reinterpret_cast<void*>(static_cast<std::uintptr_t>(start));
+    const std::uint64_t mask = (alignment - 1) / _unit;
+    const std::uint64_t length = bytes / _unit;
+    const auto allocateFrom = [&]<class Word>(DaBlockLedger<Word>& ledger) -> void* {
+        constexpr Word NONE = DaBlockLedger<Word>::NONE;
+        Word start = NONE;
+        if (mask <= std::numeric_limits<Word>::max()) {
+            start = ledger.allocate(static_cast<Word>(length), static_cast<Word>(mask));
+        } else {
+            // The arena has one address at the most that is aligned so far.
+            const std::uint64_t offset = (0 - _base) & (alignment - 1);
+            if (offset < _size &&
+                ledger.allocateAt(static_cast<Word>(offset / _unit), static_cast<Word>(length))) {
+                start = static_cast<Word>(offset / _unit);
+            }
+        }
+        return start == NONE ? nullptr : pointerTo(_base + start * _unit);
+    };
+    return std::visit(allocateFrom, _ledger);
 }
 
 void DaFirstFitArena::deallocate(void* block) {
-    const std::uint64_t address = addressOf(block);
-    const std::uint64_t length = _allocatedBlocks.remove(address);
-    if (length == 0) {
+    const std::uint64_t offset = addressOf(block) - _base;
+    const bool isInside = offset < _size && offset % _unit == 0;
+    const bool isTaken =
+        isInside && std::visit(
+                        [&]<class Word>(DaBlockLedger<Word>& ledger) {
+                            return ledger.deallocate(static_cast<Word>(offset / _unit));
+                        },
+                        _ledger);
+    if (!isTaken) {
         Assertions::throwAssertionFailed(ORV_FILE, 185, "blockEntry != _allocatedBlocks.end()");
-    }
-    giveBack({address, length});
-    _freeBytes += length;
-}
-
-/// Takes a stretch out of the free block that contains it.
-void DaFirstFitArena::carve(DaFreeBlockTree::Position& position, DaBlock taken) noexcept {
-    const DaBlock whole = _freeBlocks.at(position);
-    const DaBlock front{whole.address, taken.address - whole.address};
-    const DaBlock back{taken.address + taken.length, whole.length - front.length - taken.length};
-    if (front.length == 0 && back.length == 0) {
-        _freeBlocks.erase(position);
-    } else if (front.length == 0) {
-        _freeBlocks.replace(position, back);
-    } else {
-        _freeBlocks.replace(position, front);
-        if (back.length > 0) _freeBlocks.insertBehind(position, back);
-    }
-}
-
-/// Adds a stretch to the free blocks, joined with those that it touches.
-void DaFirstFitArena::giveBack(DaBlock block) noexcept {
-    DaFreeBlockTree::Position before;
-    const bool hasBefore = _freeBlocks.findBefore(block.address, before);
-    DaFreeBlockTree::Position behind = before;
-    const bool hasBehind = _freeBlocks.moveToNext(behind);
-
-    const DaBlock left = hasBefore ? _freeBlocks.at(before) : DaBlock{};
-    const DaBlock right = hasBehind ? _freeBlocks.at(behind) : DaBlock{};
-    const bool joinsLeft = hasBefore && left.address + left.length == block.address;
-    const bool joinsRight = hasBehind && block.address + block.length == right.address;
-
-    if (joinsLeft && joinsRight) {
-        _freeBlocks.replace(before, {left.address, left.length + block.length + right.length});
-        _freeBlocks.erase(behind);
-    } else if (joinsLeft) {
-        _freeBlocks.replace(before, {left.address, left.length + block.length});
-    } else if (joinsRight) {
-        _freeBlocks.replace(behind, {block.address, block.length + right.length});
-    } else {
-        _freeBlocks.insertBehind(before, block);
     }
 }
 
 DaArenaStatistics DaFirstFitArena::getStatistics() const noexcept {
-    std::uint64_t largestFreeBlock = 0;
-    DaFreeBlockTree::Position position;
-    _freeBlocks.findBefore(0, position);
-    while (_freeBlocks.moveToNext(position)) {
-        largestFreeBlock = std::max(largestFreeBlock, _freeBlocks.at(position).length);
-    }
-    return {_size, _freeBytes, largestFreeBlock, _freeBlocks.getNbBlocks(),
-            _allocatedBlocks.getNbBlocks()};
+    DaArenaStatistics statistics;
+    statistics.size = _size;
+    std::visit(
+        [&](const auto& ledger) {
+            statistics.freeBytes = ledger.getFreeLength() * _unit;
+            statistics.nbFreeBlocks = ledger.getNbFreeBlocks();
+            statistics.nbAllocatedBlocks = ledger.getNbAllocatedBlocks();
+            ledger.visitFreeBlocks([&](auto block) {
+                statistics.largestFreeBlock =
+                    std::max(statistics.largestFreeBlock, block.length * _unit);
+            });
+        },
+        _ledger);
+    return statistics;
 }
 
 void DaFirstFitArena::dump(std::ostream& stream) const {
@@ -132,12 +123,14 @@ void DaFirstFitArena::dump(std::ostream& stream) const {
 
 void DaFirstFitArena::dumpFreeBlocks(std::ostream& stream) const {
     stream << "Arena: " << _name << "\n  free block map:\n";
-    DaFreeBlockTree::Position position;
-    _freeBlocks.findBefore(0, position);
-    while (_freeBlocks.moveToNext(position)) {
-        const DaBlock block = _freeBlocks.at(position);
-        stream << formatText("    %8llu  %8llu\n", wide(block.address - _base), wide(block.length));
-    }
+    std::visit(
+        [&](const auto& ledger) {
+            ledger.visitFreeBlocks([&](auto block) {
+                stream << formatText("    %8llu  %8llu\n", wide(block.address * _unit),
+                                     wide(block.length * _unit));
+            });
+        },
+        _ledger);
 }
 
 }  // namespace Orv

@@ -2,10 +2,10 @@
 
 #include <cstdint>
 #include <iosfwd>
+#include <variant>
 
-#include "daAllocatedBlockMap.h"
 #include "daArenaStatistics.h"
-#include "daFreeBlockTree.h"
+#include "daBlockLedger.h"
 #include "resmgtApi.h"
 
 namespace Orv {
@@ -48,15 +48,18 @@ public:
     void dumpFreeBlocks(std::ostream&) const;  ///< Offset and length of every free block.
 
 private:
+    using NarrowLedger = DaBlockLedger<std::uint32_t>;
+    using WideLedger = DaBlockLedger<std::uint64_t>;
+
     const char* _name;
     std::uint64_t _base;
     std::uint64_t _size;
-    std::uint64_t _freeBytes;
-    DaFreeBlockTree _freeBlocks;  // no two of them touch
-    DaAllocatedBlockMap _allocatedBlocks;
+    std::uint64_t _unit;                             // bytes: 8 in the narrow ledger, else 1
+    std::variant<NarrowLedger, WideLedger> _ledger;  // narrow: 8-byte units, up to 32 GiB
 
-    void carve(DaFreeBlockTree::Position&, DaBlock taken) noexcept;
-    void giveBack(DaBlock) noexcept;
+    static bool fitsNarrow(std::uint64_t base, std::uint64_t size) noexcept;
+    static std::variant<NarrowLedger, WideLedger> openLedger(std::uint64_t base,
+                                                             std::uint64_t size);
 };
 
 }  // namespace Orv

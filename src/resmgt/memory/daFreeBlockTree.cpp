@@ -11,34 +11,26 @@ namespace Orv {
 namespace {
 
 constexpr std::uint32_t NO_NODE = std::numeric_limits<std::uint32_t>::max();
-constexpr std::uint64_t NO_ADDRESS = std::numeric_limits<std::uint64_t>::max();
 
-/// The longest request that a block can take if its start is rounded up by the mask.
-inline std::uint64_t fitOf(DaBlock block, std::uint64_t mask) noexcept {
-    const std::uint64_t padding = (0 - block.address) & mask;
-    return block.length > padding ? block.length - padding : 0;
-}
+template <class Word>
+constexpr Word NO_ADDRESS = std::numeric_limits<Word>::max();
 
 // The loops over the entries of a node run over all of them and without a branch: where a search
 // ends is random, and a branch guessed wrong costs more than looking at the rest.
 
 /// The first of N values that is @p wanted or more; N if there is none.
-template <std::size_t N, class ValueAt>
-inline unsigned firstAtLeast(std::uint64_t wanted, ValueAt valueAt) noexcept {
+template <unsigned N, class Word, class ValueAt>
+inline unsigned firstAtLeast(Word wanted, ValueAt valueAt) noexcept {
     unsigned first = N;
     for (unsigned i = N; i-- > 0;) first = valueAt(i) >= wanted ? i : first;
     return first;
 }
 
-template <std::size_t N, class ValueAt>
-inline std::uint64_t largestOf(ValueAt valueAt) noexcept {
-    std::uint64_t even = 0;  // two runs side by side: neither waits for the other
-    std::uint64_t odd = 0;
-    for (unsigned i = 0; i < N; i += 2) {
-        even = std::max(even, valueAt(i));
-        odd = std::max(odd, valueAt(i + 1));
-    }
-    return std::max(even, odd);
+template <unsigned N, class ValueAt>
+inline auto largestOf(ValueAt valueAt) noexcept {
+    auto largest = valueAt(0);
+    for (unsigned i = 1; i < N; ++i) largest = std::max(largest, valueAt(i));
+    return largest;
 }
 
 template <class Entries>
@@ -55,47 +47,55 @@ void reserveAmortized(Vector& vector, std::size_t n) {
 
 }  // namespace
 
-DaFreeBlockTree::DaFreeBlockTree() : _leaves{{}, NO_NODE}, _inners{{}, NO_NODE} {
+template <class Word>
+DaFreeBlockTree<Word>::DaFreeBlockTree(Word origin)
+    : _origin(origin), _leaves{{}, {}, NO_NODE}, _inners{{}, {}, NO_NODE} {
     reserve(1);
     _root = takeNode(0);
 }
 
-void DaFreeBlockTree::grow(std::size_t nbBlocks) {
+template <class Word>
+void DaFreeBlockTree<Word>::grow(std::size_t nbBlocks) {
     // Every node but the root has NB_ENTRIES_MIN entries or more, on each level.
     const std::size_t nbLeaves = nbBlocks / NB_ENTRIES_MIN + 1;
     const std::size_t nbInners = nbLeaves / (NB_ENTRIES_MIN - 1) + 1;
     if (nbLeaves >= NO_NODE) throw std::bad_alloc();
     reserveAmortized(_leaves.nodes, nbLeaves);
+    reserveAmortized(_leaves.counts, nbLeaves);
     reserveAmortized(_inners.nodes, nbInners);
+    reserveAmortized(_inners.counts, nbInners);
     for (Column& column : _columns) reserveAmortized(column.fits, nbInners);
     _nbBlocksMax = nbLeaves * NB_ENTRIES_MIN - 1;
 }
 
-std::size_t DaFreeBlockTree::useAlignment(std::uint64_t alignment) {
-    const std::uint64_t mask = alignment - 1;
+template <class Word>
+std::size_t DaFreeBlockTree<Word>::useAlignment(Word mask) {
     for (std::size_t i = 0; i < _columns.size(); ++i) {
         if (_columns[i].mask == mask) return i;
     }
     Column column{mask, {}};
-    column.fits.reserve(_inners.nodes.capacity());
+    column.fits.reserve(std::max(_inners.nodes.capacity(), std::size_t(1)));
     column.fits.resize(_inners.nodes.size());
     fillColumn(column, _rootLevel, _root);
     _columns.push_back(std::move(column));
     return _columns.size() - 1;
 }
 
-void DaFreeBlockTree::fillColumn(Column& column, unsigned level, NodeIndex index) const noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::fillColumn(Column& column, unsigned level,
+                                       NodeIndex index) const noexcept {
     if (level == 0) return;
     const Node& node = _inners.nodes[index];
-    for (unsigned i = 0; i < node.count; ++i) {
+    for (unsigned i = 0; i < _inners.counts[index]; ++i) {
         const auto child = static_cast<NodeIndex>(node.value[i]);
         fillColumn(column, level - 1, child);
         column.fits[index][i] = summaryOf(column, level - 1, child);
     }
 }
 
-bool DaFreeBlockTree::findFit(std::uint64_t size, std::size_t alignmentNb,
-                              Position& position) const noexcept {
+template <class Word>
+bool DaFreeBlockTree<Word>::findFit(Word size, std::size_t alignmentNb,
+                                    Position& position) const noexcept {
     const Column& column = _columns[alignmentNb];
     NodeIndex index = _root;
     for (unsigned level = _rootLevel; level > 0; --level) {
@@ -115,7 +115,8 @@ bool DaFreeBlockTree::findFit(std::uint64_t size, std::size_t alignmentNb,
     return slot < FANOUT;
 }
 
-bool DaFreeBlockTree::findBefore(std::uint64_t address, Position& position) const noexcept {
+template <class Word>
+bool DaFreeBlockTree<Word>::findBefore(Word address, Position& position) const noexcept {
     const auto lastBelow = [address](const Node& node) {
         int slot = -1;
         for (unsigned i = 0; i < FANOUT; ++i) slot += node.address[i] < address;
@@ -134,13 +135,14 @@ bool DaFreeBlockTree::findBefore(std::uint64_t address, Position& position) cons
     return position._slot[0] >= 0;
 }
 
-bool DaFreeBlockTree::moveToNext(Position& position) const noexcept {
-    const auto countOf = [&](unsigned level) {
+template <class Word>
+bool DaFreeBlockTree<Word>::moveToNext(Position& position) const noexcept {
+    const auto isLast = [&](unsigned level) {
         const Pool& pool = level > 0 ? _inners : _leaves;
-        return static_cast<int>(pool.nodes[position._node[level]].count);
+        return position._slot[level] + 1 >= pool.counts[position._node[level]];
     };
     unsigned level = 0;
-    while (position._slot[level] + 1 >= countOf(level)) {
+    while (isLast(level)) {
         if (level == _rootLevel) return false;
         ++level;
     }
@@ -154,16 +156,11 @@ bool DaFreeBlockTree::moveToNext(Position& position) const noexcept {
     return true;
 }
 
-DaBlock DaFreeBlockTree::at(const Position& position) const noexcept {
-    const Node& leaf = _leaves.nodes[position._node[0]];
-    const auto slot = static_cast<unsigned>(position._slot[0]);
-    return {leaf.address[slot], leaf.value[slot]};
-}
-
-void DaFreeBlockTree::replace(const Position& position, DaBlock block) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::replace(const Position& position, Block block) noexcept {
     Node& leaf = _leaves.nodes[position._node[0]];
     const auto slot = static_cast<unsigned>(position._slot[0]);
-    const DaBlock before{leaf.address[slot], leaf.value[slot]};
+    const Block before{leaf.address[slot], leaf.value[slot]};
     leaf.address[slot] = block.address;
     leaf.value[slot] = block.length;
     carryAddressUp(position);
@@ -172,7 +169,8 @@ void DaFreeBlockTree::replace(const Position& position, DaBlock block) noexcept 
     }
 }
 
-void DaFreeBlockTree::insertBehind(Position& position, DaBlock block) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::insertBehind(Position& position, Block block) noexcept {
     makeRoom(position, 0);
     ++position._slot[0];
     openEntry(0, position._node[0], static_cast<unsigned>(position._slot[0]));
@@ -180,46 +178,46 @@ void DaFreeBlockTree::insertBehind(Position& position, DaBlock block) noexcept {
     ++_nbBlocks;
 }
 
-void DaFreeBlockTree::erase(const Position& position) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::erase(const Position& position) noexcept {
     replace(position, {at(position).address, 0});
     closeEntries(0, position._node[0], static_cast<unsigned>(position._slot[0]), 1);
     carryAddressUp(position);
     --_nbBlocks;
     for (unsigned level = 0; level < _rootLevel; ++level) {
-        if (nodeAt(level, position._node[level]).count >= NB_ENTRIES_MIN) break;
+        if (countOf(level, position._node[level]) >= NB_ENTRIES_MIN) break;
         mergeOrBalance(position, level);  // may leave the node above with one entry less
     }
     dropRootsOfOne();
 }
 
-DaFreeBlockTree::Node& DaFreeBlockTree::nodeAt(unsigned level, NodeIndex index) noexcept {
-    return (level > 0 ? _inners : _leaves).nodes[index];
-}
-
-DaFreeBlockTree::NodeIndex DaFreeBlockTree::takeNode(unsigned level) noexcept {
-    Pool& pool = level > 0 ? _inners : _leaves;
+template <class Word>
+typename DaFreeBlockTree<Word>::NodeIndex DaFreeBlockTree<Word>::takeNode(unsigned level) noexcept {
+    Pool& pool = poolOf(level);
     NodeIndex index = pool.firstUnused;
     if (index != NO_NODE) {
-        pool.firstUnused = pool.nodes[index].nextUnused;
+        pool.firstUnused = static_cast<NodeIndex>(std::exchange(pool.nodes[index].value[0], 0));
         return index;
     }
     index = static_cast<NodeIndex>(pool.nodes.size());
-    pool.nodes.emplace_back().address.fill(NO_ADDRESS);
+    pool.nodes.emplace_back().address.fill(NO_ADDRESS<Word>);
+    pool.counts.push_back(0);
     if (level > 0) {
         for (Column& column : _columns) column.fits.emplace_back();
     }
     return index;
 }
 
-void DaFreeBlockTree::returnNode(unsigned level, NodeIndex index) noexcept {
-    Node& node = nodeAt(level, index);
-    closeEntries(level, index, 0, node.count);
-    Pool& pool = level > 0 ? _inners : _leaves;
-    node.nextUnused = std::exchange(pool.firstUnused, index);
+template <class Word>
+void DaFreeBlockTree<Word>::returnNode(unsigned level, NodeIndex index) noexcept {
+    closeEntries(level, index, 0, countOf(level, index));
+    Pool& pool = poolOf(level);
+    pool.nodes[index].value[0] = std::exchange(pool.firstUnused, index);
 }
 
-std::uint64_t DaFreeBlockTree::summaryOf(const Column& column, unsigned level,
-                                         NodeIndex index) const noexcept {
+template <class Word>
+Word DaFreeBlockTree<Word>::summaryOf(const Column& column, unsigned level,
+                                      NodeIndex index) const noexcept {
     if (level > 0) {
         const Entries& fits = column.fits[index];
         return largestOf<FANOUT>([&](unsigned i) { return fits[i]; });
@@ -231,8 +229,9 @@ std::uint64_t DaFreeBlockTree::summaryOf(const Column& column, unsigned level,
 }
 
 /// Tells the nodes above of the address of the position's block, if it is their first one.
-void DaFreeBlockTree::carryAddressUp(const Position& position) noexcept {
-    const std::uint64_t address = _leaves.nodes[position._node[0]].address[0];
+template <class Word>
+void DaFreeBlockTree<Word>::carryAddressUp(const Position& position) noexcept {
+    const Word address = _leaves.nodes[position._node[0]].address[0];
     for (unsigned level = 1; level <= _rootLevel && position._slot[level - 1] == 0; ++level) {
         const auto slot = static_cast<unsigned>(position._slot[level]);
         _inners.nodes[position._node[level]].address[slot] = address;
@@ -240,11 +239,12 @@ void DaFreeBlockTree::carryAddressUp(const Position& position) noexcept {
 }
 
 /// Tells the nodes above that the fit of the position's block has changed, as far as they feel it.
-void DaFreeBlockTree::carryFitUp(Column& column, const Position& position, std::uint64_t fitBefore,
-                                 std::uint64_t fit) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::carryFitUp(Column& column, const Position& position, Word fitBefore,
+                                       Word fit) noexcept {
     for (unsigned level = 1; level <= _rootLevel; ++level) {
         const auto slot = static_cast<unsigned>(position._slot[level]);
-        std::uint64_t& known = column.fits[position._node[level]][slot];
+        Word& known = column.fits[position._node[level]][slot];
         if (fit < known) {
             if (fitBefore < known) return;  // another entry is the largest
             fit = summaryOf(column, level - 1, position._node[level - 1]);
@@ -255,15 +255,17 @@ void DaFreeBlockTree::carryFitUp(Column& column, const Position& position, std::
 }
 
 /// Brings an entry up to date with the node below it, which is on that level.
-void DaFreeBlockTree::summarize(unsigned level, NodeIndex parent, unsigned slot) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::summarize(unsigned level, NodeIndex parent, unsigned slot) noexcept {
     Node& node = _inners.nodes[parent];
     const auto child = static_cast<NodeIndex>(node.value[slot]);
     node.address[slot] = nodeAt(level, child).address[0];
     for (Column& column : _columns) column.fits[parent][slot] = summaryOf(column, level, child);
 }
 
-void DaFreeBlockTree::copyEntries(unsigned level, NodeIndex from, unsigned slot, NodeIndex to,
-                                  unsigned toSlot, unsigned nbEntries) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::copyEntries(unsigned level, NodeIndex from, unsigned slot, NodeIndex to,
+                                        unsigned toSlot, unsigned nbEntries) noexcept {
     moveEntries(nodeAt(level, from).address, slot, nodeAt(level, to).address, toSlot, nbEntries);
     moveEntries(nodeAt(level, from).value, slot, nodeAt(level, to).value, toSlot, nbEntries);
     if (level == 0) return;
@@ -273,32 +275,35 @@ void DaFreeBlockTree::copyEntries(unsigned level, NodeIndex from, unsigned slot,
 }
 
 /// Moves the entries from the slot on one further; the one at the slot takes no request.
-void DaFreeBlockTree::openEntry(unsigned level, NodeIndex index, unsigned slot) noexcept {
-    Node& node = nodeAt(level, index);
-    copyEntries(level, index, slot, index, slot + 1, node.count - slot);
-    node.value[slot] = 0;
-    ++node.count;
+template <class Word>
+void DaFreeBlockTree<Word>::openEntry(unsigned level, NodeIndex index, unsigned slot) noexcept {
+    copyEntries(level, index, slot, index, slot + 1, countOf(level, index) - slot);
+    nodeAt(level, index).value[slot] = 0;
+    ++countOf(level, index);
 }
 
 /// Removes entries; those behind them move up.
-void DaFreeBlockTree::closeEntries(unsigned level, NodeIndex index, unsigned slot,
-                                   unsigned nbEntries) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::closeEntries(unsigned level, NodeIndex index, unsigned slot,
+                                         unsigned nbEntries) noexcept {
     Node& node = nodeAt(level, index);
     const unsigned end = slot + nbEntries;
-    copyEntries(level, index, end, index, slot, node.count - end);
-    node.count -= nbEntries;
-    std::fill_n(node.address.begin() + node.count, nbEntries, NO_ADDRESS);
-    std::fill_n(node.value.begin() + node.count, nbEntries, 0);
+    const unsigned newCount = countOf(level, index) - nbEntries;
+    copyEntries(level, index, end, index, slot, newCount - slot);
+    countOf(level, index) = static_cast<std::uint8_t>(newCount);
+    std::fill_n(node.address.begin() + newCount, nbEntries, NO_ADDRESS<Word>);
+    std::fill_n(node.value.begin() + newCount, nbEntries, Word(0));
     if (level == 0) return;
     for (Column& column : _columns) {
-        std::fill_n(column.fits[index].begin() + node.count, nbEntries, 0);
+        std::fill_n(column.fits[index].begin() + newCount, nbEntries, Word(0));
     }
 }
 
 /// Splits the position's node on that level if it is full; the position follows its entry.
-void DaFreeBlockTree::makeRoom(Position& position, unsigned level) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::makeRoom(Position& position, unsigned level) noexcept {
     const NodeIndex index = position._node[level];
-    if (nodeAt(level, index).count < FANOUT) return;
+    if (countOf(level, index) < FANOUT) return;
     if (level == _rootLevel) {
         addRoot(position);
     } else {
@@ -309,7 +314,7 @@ void DaFreeBlockTree::makeRoom(Position& position, unsigned level) noexcept {
     const auto slot = static_cast<unsigned>(position._slot[level + 1]);
     const NodeIndex sibling = takeNode(level);
     copyEntries(level, index, HALF, sibling, 0, FANOUT - HALF);
-    nodeAt(level, sibling).count = FANOUT - HALF;
+    countOf(level, sibling) = FANOUT - HALF;
     closeEntries(level, index, HALF, FANOUT - HALF);
     openEntry(level + 1, parent, slot + 1);
     _inners.nodes[parent].value[slot + 1] = sibling;
@@ -323,7 +328,8 @@ void DaFreeBlockTree::makeRoom(Position& position, unsigned level) noexcept {
     }
 }
 
-void DaFreeBlockTree::addRoot(Position& position) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::addRoot(Position& position) noexcept {
     const NodeIndex root = takeNode(_rootLevel + 1);
     openEntry(_rootLevel + 1, root, 0);
     _inners.nodes[root].value[0] = _root;
@@ -336,45 +342,50 @@ void DaFreeBlockTree::addRoot(Position& position) noexcept {
 
 /// Joins the position's node on that level, which has too few entries, with its neighbour, or
 /// shares the neighbour's entries evenly if those are too many to be joined.
-void DaFreeBlockTree::mergeOrBalance(const Position& position, unsigned level) noexcept {
+template <class Word>
+void DaFreeBlockTree<Word>::mergeOrBalance(const Position& position, unsigned level) noexcept {
     const NodeIndex parent = position._node[level + 1];
     const auto slot = static_cast<unsigned>(position._slot[level + 1]);
     const unsigned leftSlot = slot > 0 ? slot - 1 : 0;
     const auto left = static_cast<NodeIndex>(_inners.nodes[parent].value[leftSlot]);
     const auto right = static_cast<NodeIndex>(_inners.nodes[parent].value[leftSlot + 1]);
-    const unsigned nbLeft = nodeAt(level, left).count;
-    const unsigned nbRight = nodeAt(level, right).count;
+    const unsigned nbLeft = countOf(level, left);
+    const unsigned nbRight = countOf(level, right);
     const unsigned nbBoth = nbLeft + nbRight;
 
     if (nbBoth <= 2 * NB_ENTRIES_MIN) {
         copyEntries(level, right, 0, left, nbLeft, nbRight);
-        nodeAt(level, left).count = nbBoth;
+        countOf(level, left) = static_cast<std::uint8_t>(nbBoth);
         returnNode(level, right);
         closeEntries(level + 1, parent, leftSlot + 1, 1);
     } else if (nbLeft < nbRight) {
         const unsigned nbMoved = nbBoth / 2 - nbLeft;
         copyEntries(level, right, 0, left, nbLeft, nbMoved);
-        nodeAt(level, left).count += nbMoved;
+        countOf(level, left) = static_cast<std::uint8_t>(nbBoth / 2);
         closeEntries(level, right, 0, nbMoved);
         summarize(level, parent, leftSlot + 1);
     } else {
         const unsigned nbMoved = nbBoth / 2 - nbRight;
         copyEntries(level, right, 0, right, nbMoved, nbRight);
         copyEntries(level, left, nbLeft - nbMoved, right, 0, nbMoved);
-        nodeAt(level, right).count += nbMoved;
+        countOf(level, right) = static_cast<std::uint8_t>(nbBoth / 2);
         closeEntries(level, left, nbLeft - nbMoved, nbMoved);
         summarize(level, parent, leftSlot + 1);
     }
     summarize(level, parent, leftSlot);
 }
 
-void DaFreeBlockTree::dropRootsOfOne() noexcept {
-    while (_rootLevel > 0 && _inners.nodes[_root].count == 1) {
+template <class Word>
+void DaFreeBlockTree<Word>::dropRootsOfOne() noexcept {
+    while (_rootLevel > 0 && _inners.counts[_root] == 1) {
         const NodeIndex root = _root;
         _root = static_cast<NodeIndex>(_inners.nodes[root].value[0]);
         returnNode(_rootLevel, root);
         --_rootLevel;
     }
 }
+
+template class DaFreeBlockTree<std::uint32_t>;
+template class DaFreeBlockTree<std::uint64_t>;
 
 }  // namespace Orv

@@ -16,24 +16,33 @@ namespace Orv {
 /// long enough and, once its start is rounded up, too short. So a search goes straight down, and
 /// every operation costs the logarithm of the number of blocks.
 ///
+/// Addresses and lengths are counted in the unit of the arena, in words of 32 or 64 bits: half the
+/// width is half the memory to look through.
+///
 /// - Threads: the caller's lock.
 /// - Memory: asked for by reserve() and useAlignment() alone.
+template <class Word>
 class DaFreeBlockTree {
     static constexpr unsigned FANOUT = 16;         // entries of a node
     static constexpr unsigned NB_ENTRIES_MIN = 6;  // of a node other than the root
     static constexpr unsigned NB_LEVELS_MAX = 14;  // enough for 2^32 nodes
     using NodeIndex = std::uint32_t;
-    using Entries = std::array<std::uint64_t, FANOUT>;
+    using Entries = std::array<Word, FANOUT>;
 
 public:
     /// Where a block stands, or before the first one. Valid until a block is inserted or erased.
     class Position {
-        friend class DaFreeBlockTree;
+        friend DaFreeBlockTree;
         std::array<NodeIndex, NB_LEVELS_MAX> _node;  // the way from the leaf, level 0, to the root
         std::array<int, NB_LEVELS_MAX> _slot;        // -1 on level 0: before the first block
     };
 
-    DaFreeBlockTree();  ///< Without blocks. @throws std::bad_alloc
+    using Block = DaBlock<Word>;
+
+    /// Without blocks.
+    /// @param origin  what alignments count address 0 as.
+    /// @throws std::bad_alloc
+    explicit DaFreeBlockTree(Word origin);
 
     /// Makes sure that the tree can hold @p nbBlocks without asking for memory.
     /// @throws std::bad_alloc, the tree being unchanged.
@@ -41,49 +50,53 @@ public:
         if (nbBlocks > _nbBlocksMax) grow(nbBlocks);
     }
 
-    /// Prepares searches with an alignment, a power of two; quick when it is known already.
+    /// Prepares searches with an alignment; quick when it is in use already.
+    /// @param mask  the alignment, a power of two, less one.
     /// @return the number that stands for it in searches.
     /// @throws std::bad_alloc, the tree being unchanged.
-    std::size_t useAlignment(std::uint64_t alignment);
+    std::size_t useAlignment(Word mask);
 
     /// The block of the lowest address that has @p size bytes behind its first aligned one.
-    [[nodiscard]] bool findFit(std::uint64_t size, std::size_t alignmentNb,
-                               Position&) const noexcept;
+    [[nodiscard]] bool findFit(Word size, std::size_t alignmentNb, Position&) const noexcept;
 
     /// The last block below @p address.
     /// @return false if there is none; the position is then before the first block.
-    bool findBefore(std::uint64_t address, Position&) const noexcept;
+    bool findBefore(Word address, Position&) const noexcept;
 
     [[nodiscard]] bool moveToNext(Position&) const noexcept;  ///< False, and unmoved, at the end.
 
-    DaBlock at(const Position&) const noexcept;
+    Block at(const Position& position) const noexcept {
+        const Node& leaf = _leaves.nodes[position._node[0]];
+        const auto slot = static_cast<unsigned>(position._slot[0]);
+        return {leaf.address[slot], leaf.value[slot]};
+    }
 
     /// Changes a block, which keeps its place in the order.
-    void replace(const Position&, DaBlock) noexcept;
+    void replace(const Position&, Block) noexcept;
 
-    void insertBehind(Position&, DaBlock) noexcept;  ///< There must be room, see reserve().
+    void insertBehind(Position&, Block) noexcept;  ///< There must be room, see reserve().
     void erase(const Position&) noexcept;
 
     std::size_t getNbBlocks() const noexcept { return _nbBlocks; }
 
 private:
-    struct Node {
-        Entries address;  // of the block, or of the first one below; the largest number behind them
-        Entries value;    // a leaf's: length; else the index of the node below; 0 behind them
-        unsigned count;
-        NodeIndex nextUnused;
+    struct alignas(128) Node {  // a pair of cache lines, or two
+        Entries address;        // of the block, or of the first one below; all ones behind the last
+        Entries value;  // length, or in inner nodes index of the one below; 0 behind the last
     };
     struct Pool {
         std::vector<Node> nodes;
-        NodeIndex firstUnused;  // chain of nodes to use again
+        std::vector<std::uint8_t> counts;  // of entries, by node
+        NodeIndex firstUnused;             // chain of nodes to use again, through value[0]
     };
 
     /// For one alignment, by inner node: the longest request that each entry can take.
     struct Column {
-        std::uint64_t mask;  // the alignment less one
+        Word mask;
         std::vector<Entries> fits;
     };
 
+    Word _origin;
     Pool _leaves;
     Pool _inners;
     std::vector<Column> _columns;  // one for each alignment in use
@@ -93,13 +106,21 @@ private:
     std::size_t _nbBlocksMax = 0;
 
     void grow(std::size_t nbBlocks);
-    Node& nodeAt(unsigned level, NodeIndex) noexcept;
+    Pool& poolOf(unsigned level) noexcept { return level > 0 ? _inners : _leaves; }
+    Node& nodeAt(unsigned level, NodeIndex index) noexcept { return poolOf(level).nodes[index]; }
+    std::uint8_t& countOf(unsigned level, NodeIndex index) noexcept {
+        return poolOf(level).counts[index];
+    }
+    Word fitOf(Block block, Word mask) const noexcept {
+        const Word padding = (Word(0) - (_origin + block.address)) & mask;
+        return block.length > padding ? block.length - padding : 0;
+    }
     NodeIndex takeNode(unsigned level) noexcept;
     void returnNode(unsigned level, NodeIndex) noexcept;
-    std::uint64_t summaryOf(const Column&, unsigned level, NodeIndex) const noexcept;
+    Word summaryOf(const Column&, unsigned level, NodeIndex) const noexcept;
     void fillColumn(Column&, unsigned level, NodeIndex) const noexcept;
     void carryAddressUp(const Position&) noexcept;
-    void carryFitUp(Column&, const Position&, std::uint64_t fitBefore, std::uint64_t fit) noexcept;
+    void carryFitUp(Column&, const Position&, Word fitBefore, Word fit) noexcept;
     void summarize(unsigned level, NodeIndex parent, unsigned slot) noexcept;
     void openEntry(unsigned level, NodeIndex, unsigned slot) noexcept;
     void closeEntries(unsigned level, NodeIndex, unsigned slot, unsigned nbEntries) noexcept;
@@ -110,5 +131,8 @@ private:
     void mergeOrBalance(const Position&, unsigned level) noexcept;
     void dropRootsOfOne() noexcept;
 };
+
+extern template class DaFreeBlockTree<std::uint32_t>;
+extern template class DaFreeBlockTree<std::uint64_t>;
 
 }  // namespace Orv

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <iosfwd>
 #include <memory>
 
@@ -39,8 +40,8 @@ public:
     /// @throws PriorityEx as long as the manager's relations contradict themselves.
     int getPriority() const;
 
-    void setPriority(
-        int number);  ///< Fixes the number, or with DERIVED leaves it to the relations.
+    /// Fixes the number, or with DERIVED leaves it to the relations.
+    void setPriority(int number);
 
     PriorityMgr& getMgr() const noexcept { return _mgr; }
     LiString getName() const;
@@ -58,12 +59,11 @@ protected:
     /// Called with the new number after an update has changed it (or isTied()), and with the first
     /// one; what it throws is traced. It may use, create and destroy priorities and relations.
     ///
-    /// - Threads: called by any thread that updates, without the manager's lock, for one priority
-    /// by
-    ///   one thread at a time. Threads other than the one that constructed the priority call it
-    ///   once a relation, getPriority() or setPriority() has used it. A class that overrides this
-    ///   calls PriorityMgr::remove() at the beginning of its destructor, which waits for a running
-    ///   call.
+    /// - Threads: called on any thread that updates, without the manager's lock, and for one
+    ///   priority on one thread at a time. Other threads than the one that constructed it call it
+    ///   only once a relation, getPriority() or setPriority() has used it.
+    /// - A class that overrides this calls PriorityMgr::remove() at the beginning of its
+    ///   destructor; that waits for a call on another thread.
     virtual void updatePriority(int number);
 
 private:

@@ -28,9 +28,8 @@ public:
     std::span<const Arc> arcsTo(Node node) const noexcept;
 
     /// Puts nodes that lie on a circle together into one class.
-    /// @return the class of each node. Classes count from 0, and every arc between two classes
-    /// leads
-    ///   from the smaller to the greater, so counting through them goes upwards.
+    /// @return the class of each node. Classes count from 0 upwards: every arc between two classes
+    ///   leads from the smaller to the greater.
     std::vector<Node> findClasses() const;
 
 private:

@@ -17,8 +17,8 @@ class PriorityMgr;
 /// the manager, it becomes inert: it says nothing any more.
 ///
 /// - Threads: every member may be called by any thread.
-/// - Ownership: borrows the priorities, which may go before or after it; the manager must outlive
-/// it.
+/// - Ownership: borrows the priorities, which may go before or after it, and the manager, which
+///   must outlive it.
 class ORV_RESMGT_API PriorityRelation {
 public:
     enum Relation {

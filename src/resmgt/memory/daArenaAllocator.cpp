@@ -1,0 +1,7 @@
+#include "daArenaAllocator.h"
+
+namespace Orv {
+
+DaArenaAllocator::~DaArenaAllocator() = default;
+
+}  // namespace Orv

@@ -1,0 +1,66 @@
+#pragma once
+
+#include <exception>
+#include <stdexcept>
+#include <string>
+
+#include "exBase.h"
+#include "objPtr.h"
+#include "resmgtApi.h"
+
+namespace Orv {
+
+/// Errors of threads.
+class ORV_RESMGT_API MtEx : public ExBase, public std::runtime_error {
+public:
+    class ExRealTimeNotEnabled;
+    class ExThrownException;
+    class ExStdThrownException;
+    class ExNoContent;
+
+    const char* what() const noexcept override;
+
+protected:
+    MtEx(const char* file, int line);
+};
+
+/// The system refuses real time: "Failure to enable real-time: <the system's explanation>."
+class ORV_RESMGT_API MtEx::ExRealTimeNotEnabled : public ExConcrete<ExRealTimeNotEnabled, MtEx> {
+public:
+    ExRealTimeNotEnabled(const char* file, int line, const std::string& explanation);
+};
+
+/// What a thread's body threw, told to the thread that joins it: an exception of the system.
+class ORV_RESMGT_API MtEx::ExThrownException : public ExConcrete<ExThrownException, MtEx> {
+public:
+    /// Keeps a clone of @p thrown, whose reason becomes part of this one's.
+    ExThrownException(const char* file, int line, const std::string& thread, const ExBase& thrown);
+    ExThrownException(const ExThrownException&);  ///< Clones what was thrown.
+
+    const ExBase& getThrown() const noexcept { return *_thrown.get(); }
+
+private:
+    ObjPtr<ExBase> _thrown;  // never null
+};
+
+/// The same for any other exception: of the standard library, or of a type of its own.
+class ORV_RESMGT_API MtEx::ExStdThrownException : public ExConcrete<ExStdThrownException, MtEx> {
+public:
+    /// @param description  what the exception says, or its type.
+    ExStdThrownException(const char* file, int line, const std::string& thread,
+                         const std::string& description, std::exception_ptr thrown);
+
+    /// The exception itself, for std::rethrow_exception(); never null.
+    const std::exception_ptr& getThrown() const noexcept { return _thrown; }
+
+private:
+    std::exception_ptr _thrown;
+};
+
+/// A slot of thread data made no value.
+class ORV_RESMGT_API MtEx::ExNoContent : public ExConcrete<ExNoContent, MtEx> {
+public:
+    ExNoContent(const char* file, int line, const char* slot);
+};
+
+}  // namespace Orv

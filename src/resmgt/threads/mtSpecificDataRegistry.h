@@ -1,0 +1,53 @@
+#pragma once
+
+#include <cstddef>
+#include <map>
+
+#include "lkRecLock.h"
+#include "lkThreadId.h"
+#include "resmgtApi.h"
+#include "threadSafety.h"
+
+namespace Orv {
+
+class MtOpaqueData;
+
+/// Which slots hold a value for which thread, so that each value is deleted once: when its thread
+/// ends or when its slot goes. One for the process, never destroyed.
+///
+/// - Threads: any. No deleter runs under its lock.
+class ORV_RESMGT_API MtSpecificDataRegistry {
+public:
+    static MtSpecificDataRegistry& getInstance();
+
+    /// Remembers that the slot holds a value for the calling thread; asserts that "data" is given.
+    void addSpecificData(const MtOpaqueData* data);
+
+    /// Deletes every value of the calling thread, those that deleters make included. What a deleter
+    /// throws keeps no other from running; the first exception is thrown at the end.
+    void removeSpecificData();
+
+    /// Deletes the calling thread's value in one slot.
+    void removeSpecificData(const MtOpaqueData* data);
+
+    /// Deletes the values of all threads in one slot, which is about to go; traces what they throw.
+    void removeSlot(const MtOpaqueData* data) noexcept;
+
+    std::size_t getNbValues() const;  ///< Of all threads in all slots; a snapshot.
+
+private:
+    struct Entry {
+        const MtOpaqueData* data;
+        void* value;
+    };
+    using Entries = std::multimap<LkThreadId, Entry>;
+
+    mutable LkRecLock _lock{"MtSpecificDataRegistry"};
+    Entries _entries ORV_GUARDED_BY(_lock);
+
+    MtSpecificDataRegistry() = default;
+
+    bool removeFirst();
+};
+
+}  // namespace Orv

@@ -1,0 +1,90 @@
+#include <cstdint>
+#include <cstdio>
+#include <windows.h>
+
+#include "mtUtil.h"
+#include "osError.h"
+#include "trace.h"
+
+namespace Orv {
+
+namespace {
+
+void printError(const char* step) {
+    std::fprintf(stderr, "%s: %s\n", step, OsError::describe(OsError::getLast()).c_str());
+}
+
+/// A file in the temporary folder that goes with its handle.
+HANDLE openProbeFile() {
+    char folder[MAX_PATH + 1];
+    char path[MAX_PATH + 1];
+    if (::GetTempPathA(sizeof folder, folder) == 0 ||
+        ::GetTempFileNameA(folder, "orv", 0, path) == 0) {
+        return INVALID_HANDLE_VALUE;
+    }
+    return ::CreateFileA(path, GENERIC_READ | GENERIC_WRITE | DELETE, 0, nullptr, CREATE_ALWAYS,
+                         FILE_ATTRIBUTE_TEMPORARY | FILE_FLAG_DELETE_ON_CLOSE, nullptr);
+}
+
+/// Whether the system can read the byte: 1 or 0, or -1 after another error.
+int probe(HANDLE file, const char* byte) {
+    DWORD nbWritten = 0;
+    ::SetFilePointer(file, 0, nullptr, FILE_BEGIN);
+    if (::WriteFile(file, byte, 1, &nbWritten, nullptr)) return 1;
+    const DWORD error = ::GetLastError();
+    if (error == ERROR_NOACCESS || error == ERROR_INVALID_USER_BUFFER) return 0;
+    printError("testWritable");
+    return -1;
+}
+
+/// Locks the pages that the process has committed, region by region; false if any was refused.
+bool lockCommittedMemory() {
+    bool isAllLocked = true;
+    MEMORY_BASIC_INFORMATION region;
+    const char* address = nullptr;
+    while (::VirtualQuery(address, &region, sizeof region) == sizeof region) {
+        constexpr DWORD untouchable = PAGE_NOACCESS | PAGE_GUARD;
+        if (region.State == MEM_COMMIT && (region.Protect & untouchable) == 0 &&
+            !::VirtualLock(region.BaseAddress, region.RegionSize)) {
+            isAllLocked = false;
+        }
+        address = static_cast<const char*>(region.BaseAddress) + region.RegionSize;
+    }
+    return isAllLocked;
+}
+
+}  // namespace
+
+int MtUtil::getNbProcessors() {
+    SYSTEM_INFO system;
+    ::GetSystemInfo(&system);
+    return static_cast<int>(system.dwNumberOfProcessors);
+}
+
+int MtUtil::testWritable(const void* address, int length) {
+    const HANDLE file = openProbeFile();
+    if (file == INVALID_HANDLE_VALUE) return 0;
+    SYSTEM_INFO system;
+    ::GetSystemInfo(&system);
+    const std::uintptr_t pageSize = system.dwPageSize;
+    const auto first = reinterpret_cast<std::uintptr_t>(address);
+    int result = 1;
+    std::uintptr_t offset = 0;  // of the byte to probe: the first one of each page
+    while (result == 1 && length > 0 && offset < static_cast<std::uintptr_t>(length)) {
+        result = probe(file, static_cast<const char*>(address) + offset);
+        offset += pageSize - (first + offset) % pageSize;
+    }
+    if (!::CloseHandle(file)) printError("testWritable close");
+    return result;
+}
+
+void MtUtil::lockProcessMemory() {
+    if (lockCommittedMemory()) return;
+    const int error = OsError::getLast();
+    ORV_TRACE(TraceLevel::getMain())
+        << "Process memory not locked, or not all of it: " << OsError::describe(error) << ".";
+}
+
+void MtUtil::unlockProcessMemory() {}
+
+}  // namespace Orv
