@@ -128,44 +128,6 @@ TEST(LkSema, losesNothingWherePostsMeetTimeOuts) {
     EXPECT_EQ(nbTaken, nbPosts);
 }
 
-/// Waits when its thread is at its end and has given back what waits need.
-class LastWait {
-public:
-    void begin(LkSema& sema, std::atomic<int>& nbRight) {
-        _sema = &sema;
-        _nbRight = &nbRight;
-    }
-    ~LastWait() {
-        if (_sema == nullptr) return;
-        LkSema own("own");
-        *_nbRight += !own.timedWait(0.001);
-        *_nbRight += _sema->timedWait(1000);
-    }
-
-private:
-    LkSema* _sema = nullptr;
-    std::atomic<int>* _nbRight = nullptr;
-};
-
-thread_local LastWait lastWait;
-
-TEST(LkSema, canBeWaitedForInTheLastDestructorsOfAThread) {
-    LkSema late("late");
-    std::atomic<int> nbRight{0};
-    std::vector<std::jthread> threads;
-    for (int i = 0; i < 8; ++i) {
-        threads.emplace_back([&] {
-            lastWait.begin(late, nbRight);  // made before the thread's first wait, destroyed after
-            LkSema own("own");
-            EXPECT_FALSE(own.timedWait(0.001));
-        });
-    }
-    std::this_thread::sleep_for(std::chrono::milliseconds(20));
-    for (int i = 0; i < 8; ++i) late.post();
-    threads.clear();
-    EXPECT_EQ(nbRight, 16);
-}
-
 }  // namespace
 
 }  // namespace Orv
