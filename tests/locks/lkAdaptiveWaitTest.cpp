@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <thread>
 
 #include "lkAdaptiveWait.h"
 
@@ -20,32 +21,38 @@ int countLooks(LkAdaptiveWait& wait, int nbWaits, bool paysOff) {
     return nbLooks;
 }
 
+// On threads of their own, which have no experience yet.
+
 TEST(LkAdaptiveWait, looksWhereThatPaysOffAndElseOnlyProbesEverMoreRarely) {
     if (!LkAdaptiveWait::mayLook()) GTEST_SKIP() << "this process may use only one processor";
-    LkAdaptiveWait wait;
-    EXPECT_EQ(countLooks(wait, 50, true), 50);
-    EXPECT_LE(countLooks(wait, 1000, false), 16);  // gives up, then probes
-    countLooks(wait, 4000, false);
-    EXPECT_LE(countLooks(wait, 8000, false), 4);
-    // When the partner has become quick, a probe finds out, and looking is back.
-    countLooks(wait, 10000, true);
-    EXPECT_EQ(countLooks(wait, 50, true), 50);
+    std::jthread([] {
+        LkAdaptiveWait wait;
+        EXPECT_EQ(countLooks(wait, 50, true), 50);
+        EXPECT_LE(countLooks(wait, 1000, false), 16);  // gives up, then probes
+        countLooks(wait, 4000, false);
+        EXPECT_LE(countLooks(wait, 8000, false), 4);
+        // When the partner has become quick, a probe finds out, and looking is back.
+        countLooks(wait, 10000, true);
+        EXPECT_EQ(countLooks(wait, 50, true), 50);
+    }).join();
 }
 
 TEST(LkAdaptiveWait, newObjectsStartFromTheExperienceOfTheThread) {
     if (!LkAdaptiveWait::mayLook()) GTEST_SKIP() << "this process may use only one processor";
-    int nbLooks = 0;
-    for (int i = 0; i < 200; ++i) {
-        LkAdaptiveWait used;  // such as the semaphore of a single request
-        nbLooks += countLooks(used, 1, false);
-    }
-    EXPECT_LE(nbLooks, 20);
-    for (int i = 0; i < 5000; ++i) {
-        LkAdaptiveWait used;
-        countLooks(used, 1, true);
-    }
-    LkAdaptiveWait next;
-    EXPECT_EQ(countLooks(next, 1, true), 1);
+    std::jthread([] {
+        int nbLooks = 0;
+        for (int i = 0; i < 200; ++i) {
+            LkAdaptiveWait used;  // such as the semaphore of a single request
+            nbLooks += countLooks(used, 1, false);
+        }
+        EXPECT_LE(nbLooks, 20);
+        for (int i = 0; i < 5000; ++i) {
+            LkAdaptiveWait used;
+            countLooks(used, 1, true);
+        }
+        LkAdaptiveWait next;
+        EXPECT_EQ(countLooks(next, 1, true), 1);
+    }).join();
 }
 
 TEST(LkAdaptiveWait, aLookIsBounded) {

@@ -128,32 +128,6 @@ TEST(LkSema, losesNothingWherePostsMeetTimeOuts) {
     EXPECT_EQ(nbTaken, nbPosts);
 }
 
-/// Waits when its thread is at its end and has given back what waits need.
-class LastWait {
-public:
-    void begin(std::atomic<int>& nbRight) { _nbRight = &nbRight; }
-    ~LastWait() {
-        if (_nbRight == nullptr) return;
-        LkSema sema("sema");
-        std::jthread poster([&] { sema.post(); });
-        for (int i = 0; i < 2; ++i) *_nbRight += sema.timedWait(i == 0 ? 1000 : 0.001) == (i == 0);
-    }
-
-private:
-    std::atomic<int>* _nbRight = nullptr;
-};
-
-TEST(LkSema, canBeWaitedForInTheLastDestructorsOfAThread) {
-    static thread_local LastWait lastWait;
-    std::atomic<int> nbRight{0};
-    onThreads(8, [&](int) {
-        lastWait.begin(nbRight);  // made before the thread's first wait, so destroyed after
-        LkSema sema("sema");
-        EXPECT_FALSE(sema.timedWait(0.001));
-    });
-    EXPECT_EQ(nbRight, 16);
-}
-
 }  // namespace
 
 }  // namespace Orv

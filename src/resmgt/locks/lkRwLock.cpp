@@ -11,6 +11,11 @@ namespace {
 constexpr auto relaxed = std::memory_order_relaxed;
 constexpr auto acquire = std::memory_order_acquire;
 
+/// Leaves the word alone for a while: who has it gets more done than if both want it all the time.
+void backOff() noexcept {
+    for (int i = 0; i < 6; ++i) __builtin_ia32_pause();
+}
+
 /// Makes up to @p tries attempts, 0 being very many, within the while that a wait may look.
 template <class Attempt>
 bool spin(unsigned tries, Attempt attempt) {
@@ -60,7 +65,16 @@ bool LkRwLock::tryReadLock() const noexcept {
 }
 
 bool LkRwLock::readLock() const {
-    if (!tryReadLock() && !_readersWait.look([this] { return tryReadLock(); })) waitToRead();
+    // Counting first and asking afterwards takes one access to a word that other readers change,
+    // too.
+    const std::uint32_t word = _word.fetch_add(READER, acquire);
+    if ((word & (WRITER | WRITERS_WAIT)) == 0) return true;
+    release(READER);
+    const auto tryAgain = [this] {
+        backOff();
+        return tryReadLock();
+    };
+    if (!_readersWait.look(tryAgain)) waitToRead();
     return true;
 }
 
@@ -81,14 +95,18 @@ void LkRwLock::waitToRead() const {
 
 bool LkRwLock::tryWriteLock() noexcept {
     std::uint32_t word = _word.load(relaxed);
-    while ((word & (WRITER | READERS)) == 0) {
+    while ((word & HOLDERS) == 0) {
         if (_word.compare_exchange_weak(word, word | WRITER, acquire, relaxed)) return true;
     }
     return false;
 }
 
 bool LkRwLock::writeLock() {
-    if (!tryWriteLock() && !_writersWait.look([this] { return tryWriteLock(); })) waitToWrite();
+    const auto tryAgain = [this] {
+        backOff();
+        return tryWriteLock();
+    };
+    if (!tryWriteLock() && !_writersWait.look(tryAgain)) waitToWrite();
     return true;
 }
 
@@ -108,27 +126,29 @@ void LkRwLock::waitToWrite() {
 // --- releasing ---
 
 void LkRwLock::unlock() const {
+    const std::uint32_t word = _word.load(relaxed);
+    ORV_ASSERT_TEXT((word & HOLDERS) != 0, "_state != 0");
+    release((word & WRITER) != 0 ? WRITER : READER);
+}
+
+/// @param holder  who goes: a writer, or a reader, which may have counted itself in vain.
+void LkRwLock::release(std::uint32_t holder) const {
     std::uint32_t word = _word.load(relaxed);
     for (;;) {
-        const std::uint32_t holders = word & (WRITER | READERS);
-        ORV_ASSERT_TEXT(holders != 0, "_state != 0");
-        const bool isLast = holders == WRITER || holders == READER;
-        if (isLast && (word & (WRITERS_WAIT | READERS_WAIT)) != 0) return unlockForWaiters();
-        const std::uint32_t next = word - (holders == WRITER ? WRITER : READER);
+        const std::uint32_t next = word - holder;
+        if ((next & HOLDERS) == 0 && next != FREE) return releaseForWaiters(holder);
         // From here on the lock may be gone.
-        if (_word.compare_exchange_weak(word, next, std::memory_order_release, relaxed)) return;
+        if (_word.compare_exchange_strong(word, next, std::memory_order_release, relaxed)) return;
+        backOff();
+        word = _word.load(relaxed);
     }
 }
 
 /// Those who wait cannot go on before this has released the mutex, so they are still here.
-void LkRwLock::unlockForWaiters() const {
+void LkRwLock::releaseForWaiters(std::uint32_t holder) const {
     const LkGuard guard(_mutex);
-    std::uint32_t word = _word.load(relaxed);
-    std::uint32_t next = 0;
-    do {
-        next = word - ((word & WRITER) != 0 ? WRITER : READER);
-    } while (!_word.compare_exchange_weak(word, next, std::memory_order_acq_rel, relaxed));
-    if ((next & (WRITER | READERS)) == 0) wakeNext();
+    const std::uint32_t next = _word.fetch_sub(holder, std::memory_order_acq_rel) - holder;
+    if ((next & HOLDERS) == 0) wakeNext();
 }
 
 void LkRwLock::wakeNext() const {
@@ -146,7 +166,7 @@ void LkRwLock::wakeNext() const {
 // --- asking ---
 
 bool LkRwLock::isLocked() const noexcept {
-    return (_word.load(relaxed) & (WRITER | READERS)) != 0;
+    return (_word.load(relaxed) & HOLDERS) != 0;
 }
 
 void LkRwLock::dump(std::ostream& stream) const {

@@ -44,9 +44,11 @@ private:
     // Holders and flags in one word, so that nobody needs the mutex unless somebody waits. The
     // flags are raised with the mutex held; while one is up, the lock becomes free with the mutex
     // held.
+    static constexpr std::uint32_t FREE = 0;
     static constexpr std::uint32_t READER = 1;
     static constexpr std::uint32_t READERS = (1U << 29) - 1;
     static constexpr std::uint32_t WRITER = 1U << 29;
+    static constexpr std::uint32_t HOLDERS = READERS | WRITER;
     static constexpr std::uint32_t WRITERS_WAIT = 1U << 30;
     static constexpr std::uint32_t READERS_WAIT = 1U << 31;
 
@@ -77,7 +79,8 @@ private:
 
     void waitToRead() const;
     void waitToWrite();
-    void unlockForWaiters() const;
+    void release(std::uint32_t holder) const;
+    void releaseForWaiters(std::uint32_t holder) const;
     void wakeNext() const ORV_REQUIRES(_mutex);
 };
 

@@ -5,9 +5,11 @@
 #if defined(_WIN32)
 #include "lkAddressWaitWindows.h"
 #include "lkParkerWindows.h"
+#include "lkWaiterSlotWindows.h"
 #else
 #include "lkAddressWaitPosix.h"
 #include "lkParkerPosix.h"
+#include "lkWaiterSlotPosix.h"
 #endif
 
 namespace Orv {
@@ -15,9 +17,11 @@ namespace Orv {
 #if defined(_WIN32)
 using LkAddressWait = LkAddressWaitWindows;
 using LkParker = LkParkerWindows;
+using LkWaiterSlot = LkWaiterSlotWindows;
 #else
 using LkAddressWait = LkAddressWaitPosix;
 using LkParker = LkParkerPosix;
+using LkWaiterSlot = LkWaiterSlotPosix;
 #endif
 
 }  // namespace Orv

@@ -16,7 +16,7 @@ public:
         return *new LkWaiter;
     }
 
-    static void giveBack(LkWaiter& waiter) noexcept {
+    static void giveBack(LkWaiter& waiter) {
         const std::lock_guard guard(mutex());
         waiter._next = std::exchange(first, &waiter);
     }
@@ -31,38 +31,17 @@ private:
     }
 };
 
-namespace {
-
-// Plain data, so that a wait in a thread's last destructors still finds it.
-constinit thread_local LkWaiter* ownWaiter = nullptr;
-constinit thread_local bool isThreadEnding = false;
-
-/// Gives the thread's waiter back when the thread ends.
-struct Owner {
-    ~Owner() {
-        isThreadEnding = true;
-        if (ownWaiter != nullptr) LkWaiterPool::giveBack(*std::exchange(ownWaiter, nullptr));
+LkWaiter::Use::Use() : _waiter(LkWaiterSlot::get()) {
+    if (_waiter == nullptr) {
+        _waiter = &LkWaiterPool::take();
+        // A wait in the last destructors of a thread has its waiter for this once.
+        _isBorrowed = !LkWaiterSlot::set(*_waiter, LkWaiterPool::giveBack);
     }
-    void watch() noexcept {}
-};
-thread_local Owner owner;
-
-LkWaiter& waiterOfThread() {
-    if (ownWaiter == nullptr) {
-        if (!isThreadEnding) owner.watch();
-        ownWaiter = &LkWaiterPool::take();
-    }
-    return *ownWaiter;
-}
-
-}  // namespace
-
-LkWaiter::Use::Use() : _waiter(waiterOfThread()) {
-    _waiter.prepare();
+    _waiter->prepare();
 }
 
 LkWaiter::Use::~Use() {
-    if (isThreadEnding) LkWaiterPool::giveBack(*std::exchange(ownWaiter, nullptr));
+    if (_isBorrowed) LkWaiterPool::giveBack(*_waiter);
 }
 
 bool LkWaiter::sleepUntilReleased(const LkTimeLimit& limit) {

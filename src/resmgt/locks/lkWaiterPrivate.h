@@ -52,11 +52,11 @@ public:
     Use(const Use&) = delete;
     Use& operator=(const Use&) = delete;
 
-    LkWaiter& operator*() const noexcept { return _waiter; }
-    LkWaiter* operator->() const noexcept { return &_waiter; }
+    LkWaiter& operator*() const noexcept { return *_waiter; }
 
 private:
-    LkWaiter& _waiter;
+    LkWaiter* _waiter;
+    bool _isBorrowed = false;
 };
 
 }  // namespace Orv
