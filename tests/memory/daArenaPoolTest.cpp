@@ -5,11 +5,21 @@
 #include <vector>
 
 #include "daArenaPool.h"
-#include "daHeapShortage.h"
 #include "daMallocAllocator.h"
 #include "daMemoryMapAllocator.h"
 #include "exSysError.h"
 #include "expectThrows.h"
+#include "hmHeapMgr.h"
+
+// The sanitizers' allocators are to return null for too much memory, as malloc() does.
+extern "C" const char* __asan_default_options();
+extern "C" const char* __tsan_default_options();
+extern "C" const char* __asan_default_options() {
+    return "allocator_may_return_null=1";
+}
+extern "C" const char* __tsan_default_options() {
+    return "allocator_may_return_null=1";
+}
 
 namespace Orv {
 
@@ -98,10 +108,10 @@ TEST(DaArenaPool, throwsWhatTheAllocatorThrows) {
 TEST(DaArenaPool, keepsNoBlockWhenItsBooksFindNoMemory) {
     CountingAllocator allocator;
     int nbRefused = 0;
-    for (std::size_t nbGranted = 0;; ++nbGranted) {
+    for (std::uint32_t nbGranted = 0;; ++nbGranted) {
         ObjPtr<DaArenaPool> pool;
         try {
-            const DaHeapShortage shortage(nbGranted);
+            const HmHeapMgr::Shortage shortage(nbGranted);
             pool = DaArenaPool::create(&allocator, 4096);
         } catch (const std::bad_alloc&) {
             ++nbRefused;

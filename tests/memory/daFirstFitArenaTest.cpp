@@ -5,8 +5,8 @@
 #include <vector>
 
 #include "daFirstFitArena.h"
-#include "daHeapShortage.h"
 #include "expectThrows.h"
+#include "hmHeapMgr.h"
 
 namespace Orv {
 
@@ -291,10 +291,10 @@ TEST(DaFirstFitArena, isUnchangedWhenItsBooksFindNoMemory) {
         for (const Address alignment : {Address(0), Address(64)}) {
             Filled filled(nbBlocks);
             void* block = nullptr;
-            std::size_t nbGranted = 0;
+            std::uint32_t nbGranted = 0;
             for (bool isDone = false; !isDone; ++nbGranted) {
                 try {
-                    const DaHeapShortage shortage(nbGranted);
+                    const HmHeapMgr::Shortage shortage(nbGranted);
                     block = filled.arena.allocate(40, alignment);
                     isDone = true;
                 } catch (const std::bad_alloc&) {
@@ -313,9 +313,9 @@ TEST(DaFirstFitArena, findsNoMemoryOnTheWayUpAtEveryAllocationInTurn) {
     DaFirstFitArena arena(pointerTo(BASE), GIB);
     std::size_t nbRefused = 0;
     for (Address i = 0; i < 20'000; ++i) {
-        for (std::size_t nbGranted = 0;; ++nbGranted) {
+        for (std::uint32_t nbGranted = 0;; ++nbGranted) {
             try {
-                const DaHeapShortage shortage(nbGranted);
+                const HmHeapMgr::Shortage shortage(nbGranted);
                 ASSERT_EQ(arena.allocate(8), pointerTo(BASE + 8 * i));
                 break;
             } catch (const std::bad_alloc&) {
@@ -331,16 +331,13 @@ TEST(DaFirstFitArena, findsNoMemoryOnTheWayUpAtEveryAllocationInTurn) {
 TEST(DaFirstFitArena, takesBlocksBackWithoutAskingForMemory) {
     for (const std::size_t nbBlocks : {1u, 2u, 11u, 33u, 100u, 1001u, 20'000u}) {
         Filled filled(nbBlocks);
-        std::size_t nbRefused = 1;
         {
             // Every other one first: each then makes a free block of its own.
-            const DaHeapShortage shortage(0);
+            const HmHeapMgr::Shortage shortage(0);
             for (std::size_t i = 0; i < nbBlocks; i += 2) {
                 filled.arena.deallocate(pointerTo(filled.blocks[i]));
             }
-            nbRefused = shortage.getNbRefused();
         }
-        EXPECT_EQ(nbRefused, 0u);
         for (std::size_t i = 0; i < nbBlocks; i += 2) filled.model.deallocate(filled.blocks[i]);
         expectSame(filled.arena, filled.model, BASE);
         for (std::size_t i = 1; i < nbBlocks; i += 2) {
@@ -355,18 +352,23 @@ TEST(DaFirstFitArena, needsNoMemoryOnceItHasHeldAsManyBlocks) {
     std::vector<void*> blocks;
     for (int i = 0; i < 5000; ++i) blocks.push_back(arena.allocate(64, 16));
     std::mt19937 random(3);
-    std::size_t nbRefused = 1;
-    {
-        const DaHeapShortage shortage(0);
-        for (int i = 0; i < 100'000; ++i) {
-            void*& block = blocks[random() % blocks.size()];
-            arena.deallocate(block);
-            block = arena.allocate(1 + random() % 4096, 16);
-        }
-        nbRefused = shortage.getNbRefused();
+    const HmHeapMgr::Shortage shortage(0);
+    for (int i = 0; i < 100'000; ++i) {
+        void*& block = blocks[random() % blocks.size()];
+        arena.deallocate(block);
+        ASSERT_NO_THROW(block = arena.allocate(1 + random() % 4096, 16));
     }
-    EXPECT_EQ(nbRefused, 0u);
     EXPECT_EQ(arena.getStatistics().nbAllocatedBlocks, 5000u);
+}
+
+TEST(DaFirstFitArena, leavesNoMemoryBehind) {
+    const HmHeapMgr::Usage before = HmHeapMgr::getUsage();
+    {
+        const Filled filled(1000);
+        EXPECT_GT(HmHeapMgr::getUsage().bytes, before.bytes);
+    }
+    EXPECT_EQ(HmHeapMgr::getUsage().blocks, before.blocks);
+    EXPECT_EQ(HmHeapMgr::getUsage().bytes, before.bytes);
 }
 
 TEST(DaFirstFitArena, dumpsSizeBlocksAndFragmentationWhateverTheStreamIsSetTo) {

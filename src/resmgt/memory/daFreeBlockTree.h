@@ -3,9 +3,9 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <vector>
 
 #include "daBlock.h"
+#include "daBookAllocator.h"
 
 namespace Orv {
 
@@ -85,21 +85,21 @@ private:
         Entries value;  // length, or in inner nodes index of the one below; 0 behind the last
     };
     struct Pool {
-        std::vector<Node> nodes;
-        std::vector<std::uint8_t> counts;  // of entries, by node
-        NodeIndex firstUnused;             // chain of nodes to use again, through value[0]
+        DaBookVector<Node> nodes;
+        DaBookVector<std::uint8_t> counts;  // of entries, by node
+        NodeIndex firstUnused;              // chain of nodes to use again, through value[0]
     };
 
     /// For one alignment, by inner node: the longest request that each entry can take.
     struct Column {
         Word mask;
-        std::vector<Entries> fits;
+        DaBookVector<Entries> fits;
     };
 
     Word _origin;
     Pool _leaves;
     Pool _inners;
-    std::vector<Column> _columns;  // one for each alignment in use
+    DaBookVector<Column> _columns;  // one for each alignment in use
     NodeIndex _root;
     unsigned _rootLevel = 0;
     std::size_t _nbBlocks = 0;
