@@ -157,6 +157,7 @@ INSTANTIATE_TEST_SUITE_P(
     DaFirstFitArena, DaFirstFitArenaLife,
     testing::Values(
         Life{"manySmallBlocks", BASE, 96 * KIB, KIB, {0, 8, 16}, 1500, 400'000},
+        Life{"deepTree", BASE, 300 * KIB, KIB, {0, 16}, 8000, 120'000},
         Life{"everyAlignment",
              BASE,
              256 * KIB,

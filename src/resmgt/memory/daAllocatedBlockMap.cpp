@@ -1,8 +1,8 @@
-#include "daAllocatedBlockMap.h"
-
 #include <algorithm>
 #include <bit>
 #include <new>
+
+#include "daAllocatedBlockMapPrivate.h"
 
 namespace Orv {
 

@@ -3,8 +3,8 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "daBlock.h"
-#include "daBookAllocator.h"
+#include "daBlockPrivate.h"
+#include "daBookAllocatorPrivate.h"
 
 namespace Orv {
 
