@@ -1,8 +1,8 @@
-#include "daAllocatedBlockMap.h"
-
 #include <algorithm>
 #include <bit>
 #include <new>
+
+#include "daAllocatedBlockMapPrivate.h"
 
 namespace Orv {
 
@@ -55,7 +55,7 @@ void DaAllocatedBlockMap<Word>::grow(std::size_t nbBlocks) {
         if (nbSlots > _slots.max_size() / 2) throw std::bad_alloc();
         nbSlots *= 2;
     }
-    std::vector<Block> old(nbSlots);
+    DaBookVector<Block> old(nbSlots);
     old.swap(_slots);
     _shift = 64 - static_cast<unsigned>(std::countr_zero(nbSlots));
     _nbBlocksMax = maxLoadOf(nbSlots);

@@ -1,4 +1,4 @@
-#include "daBlockLedger.h"
+#include "daBlockLedgerPrivate.h"
 
 namespace Orv {
 

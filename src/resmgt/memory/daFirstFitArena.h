@@ -2,10 +2,9 @@
 
 #include <cstdint>
 #include <iosfwd>
-#include <variant>
+#include <memory>
 
 #include "daArenaStatistics.h"
-#include "daBlockLedger.h"
 #include "resmgtApi.h"
 
 namespace Orv {
@@ -26,6 +25,7 @@ public:
     /// @param name  shown by the dumps; borrowed, may be null.
     /// @throws std::bad_alloc
     DaFirstFitArena(void* base, std::uint64_t size, const char* name = nullptr);
+    ~DaFirstFitArena();
 
     DaFirstFitArena(const DaFirstFitArena&) = delete;
     DaFirstFitArena& operator=(const DaFirstFitArena&) = delete;
@@ -48,18 +48,11 @@ public:
     void dumpFreeBlocks(std::ostream&) const;  ///< Offset and length of every free block.
 
 private:
-    using NarrowLedger = DaBlockLedger<std::uint32_t>;
-    using WideLedger = DaBlockLedger<std::uint64_t>;
+    class Books;
 
     const char* _name;
-    std::uint64_t _base;
     std::uint64_t _size;
-    std::uint64_t _unit;                             // bytes: 8 in the narrow ledger, else 1
-    std::variant<NarrowLedger, WideLedger> _ledger;  // narrow: 8-byte units, up to 32 GiB
-
-    static bool fitsNarrow(std::uint64_t base, std::uint64_t size) noexcept;
-    static std::variant<NarrowLedger, WideLedger> openLedger(std::uint64_t base,
-                                                             std::uint64_t size);
+    std::unique_ptr<Books> _books;  // never null
 };
 
 }  // namespace Orv

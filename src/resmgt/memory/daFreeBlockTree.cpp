@@ -1,10 +1,10 @@
-#include "daFreeBlockTree.h"
-
 #include <algorithm>
 #include <cstring>
 #include <limits>
 #include <new>
 #include <utility>
+
+#include "daFreeBlockTreePrivate.h"
 
 namespace Orv {
 
@@ -14,24 +14,6 @@ constexpr std::uint32_t NO_NODE = std::numeric_limits<std::uint32_t>::max();
 
 template <class Word>
 constexpr Word NO_ADDRESS = std::numeric_limits<Word>::max();
-
-// The loops over the entries of a node run over all of them and without a branch: where a search
-// ends is random, and a branch guessed wrong costs more than looking at the rest.
-
-/// The first of N values that is @p wanted or more; N if there is none.
-template <unsigned N, class Word, class ValueAt>
-inline unsigned firstAtLeast(Word wanted, ValueAt valueAt) noexcept {
-    unsigned first = N;
-    for (unsigned i = N; i-- > 0;) first = valueAt(i) >= wanted ? i : first;
-    return first;
-}
-
-template <unsigned N, class ValueAt>
-inline auto largestOf(ValueAt valueAt) noexcept {
-    auto largest = valueAt(0);
-    for (unsigned i = 1; i < N; ++i) largest = std::max(largest, valueAt(i));
-    return largest;
-}
 
 template <class Entries>
 void moveEntries(const Entries& from, unsigned slot, Entries& to, unsigned toSlot,
@@ -89,7 +71,7 @@ void DaFreeBlockTree<Word>::fillColumn(Column& column, unsigned level,
     for (unsigned i = 0; i < _inners.counts[index]; ++i) {
         const auto child = static_cast<NodeIndex>(node.value[i]);
         fillColumn(column, level - 1, child);
-        column.fits[index][i] = summaryOf(column, level - 1, child);
+        column.fits[index][i] = summaryOf(column, level - 1, child, FANOUT);
     }
 }
 
@@ -99,17 +81,15 @@ bool DaFreeBlockTree<Word>::findFit(Word size, std::size_t alignmentNb,
     const Column& column = _columns[alignmentNb];
     NodeIndex index = _root;
     for (unsigned level = _rootLevel; level > 0; --level) {
-        const Entries& fits = column.fits[index];
-        const unsigned slot = firstAtLeast<FANOUT>(size, [&](unsigned i) { return fits[i]; });
+        const unsigned slot = Scan::firstAtLeast(column.fits[index], size);
         if (slot == FANOUT) return false;  // at the root only: below it there is one that fits
         position._node[level] = index;
         position._slot[level] = static_cast<int>(slot);
         index = static_cast<NodeIndex>(_inners.nodes[index].value[slot]);
     }
     const Node& leaf = _leaves.nodes[index];
-    const unsigned slot = firstAtLeast<FANOUT>(size, [&, mask = column.mask](unsigned i) {
-        return fitOf({leaf.address[i], leaf.value[i]}, mask);
-    });
+    const Entries fits = Scan::fits(leaf.address, leaf.value, _origin, column.mask);
+    const unsigned slot = Scan::firstAtLeast(fits, size);
     position._node[0] = index;
     position._slot[0] = static_cast<int>(slot);
     return slot < FANOUT;
@@ -118,9 +98,7 @@ bool DaFreeBlockTree<Word>::findFit(Word size, std::size_t alignmentNb,
 template <class Word>
 bool DaFreeBlockTree<Word>::findBefore(Word address, Position& position) const noexcept {
     const auto lastBelow = [address](const Node& node) {
-        int slot = -1;
-        for (unsigned i = 0; i < FANOUT; ++i) slot += node.address[i] < address;
-        return slot;
+        return static_cast<int>(Scan::countBelow(node.address, address)) - 1;
     };
     NodeIndex index = _root;
     for (unsigned level = _rootLevel; level > 0; --level) {
@@ -130,8 +108,9 @@ bool DaFreeBlockTree<Word>::findBefore(Word address, Position& position) const n
         position._slot[level] = slot;
         index = static_cast<NodeIndex>(node.value[static_cast<unsigned>(slot)]);
     }
+    const Node& leaf = _leaves.nodes[index];
     position._node[0] = index;
-    position._slot[0] = lastBelow(_leaves.nodes[index]);
+    position._slot[0] = lastBelow(leaf);
     return position._slot[0] >= 0;
 }
 
@@ -161,12 +140,12 @@ void DaFreeBlockTree<Word>::replace(const Position& position, Block block) noexc
     Node& leaf = _leaves.nodes[position._node[0]];
     const auto slot = static_cast<unsigned>(position._slot[0]);
     const Block before{leaf.address[slot], leaf.value[slot]};
-    leaf.address[slot] = block.address;
-    leaf.value[slot] = block.length;
-    carryAddressUp(position);
     for (Column& column : _columns) {
         carryFitUp(column, position, fitOf(before, column.mask), fitOf(block, column.mask));
     }
+    leaf.address[slot] = block.address;
+    leaf.value[slot] = block.length;
+    carryAddressUp(position);
 }
 
 template <class Word>
@@ -215,17 +194,13 @@ void DaFreeBlockTree<Word>::returnNode(unsigned level, NodeIndex index) noexcept
     pool.nodes[index].value[0] = std::exchange(pool.firstUnused, index);
 }
 
+/// The longest request that the entries of a node can take, but for one of them.
 template <class Word>
-Word DaFreeBlockTree<Word>::summaryOf(const Column& column, unsigned level,
-                                      NodeIndex index) const noexcept {
-    if (level > 0) {
-        const Entries& fits = column.fits[index];
-        return largestOf<FANOUT>([&](unsigned i) { return fits[i]; });
-    }
+Word DaFreeBlockTree<Word>::summaryOf(const Column& column, unsigned level, NodeIndex index,
+                                      unsigned except) const noexcept {
+    if (level > 0) return Scan::largest(column.fits[index], except);
     const Node& leaf = _leaves.nodes[index];
-    return largestOf<FANOUT>([&, mask = column.mask](unsigned i) {
-        return fitOf({leaf.address[i], leaf.value[i]}, mask);
-    });
+    return Scan::largest(Scan::fits(leaf.address, leaf.value, _origin, column.mask), except);
 }
 
 /// Tells the nodes above of the address of the position's block, if it is their first one.
@@ -238,20 +213,28 @@ void DaFreeBlockTree<Word>::carryAddressUp(const Position& position) noexcept {
     }
 }
 
-/// Tells the nodes above that the fit of the position's block has changed, as far as they feel it.
+/// Tells the nodes above that the fit of the position's block is about to change, as far as they
+/// feel it. An entry is written after its node was scanned: the other way round the processor's
+/// wide loads would wait for the narrow store.
 template <class Word>
 void DaFreeBlockTree<Word>::carryFitUp(Column& column, const Position& position, Word fitBefore,
                                        Word fit) noexcept {
+    Word* entry = nullptr;  // what the last step has found out to change
     for (unsigned level = 1; level <= _rootLevel; ++level) {
-        const auto slot = static_cast<unsigned>(position._slot[level]);
-        Word& known = column.fits[position._node[level]][slot];
-        if (fit < known) {
-            if (fitBefore < known) return;  // another entry is the largest
-            fit = summaryOf(column, level - 1, position._node[level - 1]);
+        Word& known =
+            column.fits[position._node[level]][static_cast<unsigned>(position._slot[level])];
+        Word fitAbove = std::max(fit, known);
+        if (fit < known && fitBefore == known) {
+            const auto slot = static_cast<unsigned>(position._slot[level - 1]);
+            fitAbove = std::max(fit, summaryOf(column, level - 1, position._node[level - 1], slot));
         }
-        if (fit == known) return;
-        fitBefore = std::exchange(known, fit);
+        if (entry != nullptr) *entry = fit;
+        if (fitAbove == known) return;
+        entry = &known;
+        fitBefore = known;
+        fit = fitAbove;
     }
+    if (entry != nullptr) *entry = fit;
 }
 
 /// Brings an entry up to date with the node below it, which is on that level.
@@ -260,7 +243,8 @@ void DaFreeBlockTree<Word>::summarize(unsigned level, NodeIndex parent, unsigned
     Node& node = _inners.nodes[parent];
     const auto child = static_cast<NodeIndex>(node.value[slot]);
     node.address[slot] = nodeAt(level, child).address[0];
-    for (Column& column : _columns) column.fits[parent][slot] = summaryOf(column, level, child);
+    for (Column& column : _columns)
+        column.fits[parent][slot] = summaryOf(column, level, child, FANOUT);
 }
 
 template <class Word>

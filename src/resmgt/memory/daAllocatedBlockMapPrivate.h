@@ -2,9 +2,9 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <vector>
 
-#include "daBlock.h"
+#include "daBlockPrivate.h"
+#include "daBookAllocatorPrivate.h"
 
 namespace Orv {
 
@@ -40,7 +40,7 @@ public:
     std::size_t getNbBlocks() const noexcept { return _nbBlocks; }
 
 private:
-    std::vector<Block> _slots;  // none, or a power of two of them; length 0 marks a free one
+    DaBookVector<Block> _slots;  // none, or a power of two of them; length 0 marks a free one
     std::size_t _nbBlocks = 0;
     std::size_t _nbBlocksMax = 0;  // grows before there are more
     unsigned _shift = 0;           // from a hash of 64 bits to a slot

@@ -3,9 +3,9 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "daAllocatedBlockMap.h"
-#include "daBlock.h"
-#include "daFreeBlockTree.h"
+#include "daAllocatedBlockMapPrivate.h"
+#include "daBlockPrivate.h"
+#include "daFreeBlockTreePrivate.h"
 
 namespace Orv {
 

@@ -3,9 +3,10 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <vector>
 
-#include "daBlock.h"
+#include "daBlockPrivate.h"
+#include "daBookAllocatorPrivate.h"
+#include "daNodeScanPrivate.h"
 
 namespace Orv {
 
@@ -23,11 +24,12 @@ namespace Orv {
 /// - Memory: asked for by reserve() and useAlignment() alone.
 template <class Word>
 class DaFreeBlockTree {
-    static constexpr unsigned FANOUT = 16;         // entries of a node
-    static constexpr unsigned NB_ENTRIES_MIN = 6;  // of a node other than the root
-    static constexpr unsigned NB_LEVELS_MAX = 14;  // enough for 2^32 nodes
+    static constexpr unsigned FANOUT = 32;          // entries of a node
+    static constexpr unsigned NB_ENTRIES_MIN = 12;  // of a node other than the root
+    static constexpr unsigned NB_LEVELS_MAX = 14;   // enough for 2^32 nodes
     using NodeIndex = std::uint32_t;
     using Entries = std::array<Word, FANOUT>;
+    using Scan = DaNodeScan<Word, FANOUT>;
 
 public:
     /// Where a block stands, or before the first one. Valid until a block is inserted or erased.
@@ -85,21 +87,21 @@ private:
         Entries value;  // length, or in inner nodes index of the one below; 0 behind the last
     };
     struct Pool {
-        std::vector<Node> nodes;
-        std::vector<std::uint8_t> counts;  // of entries, by node
-        NodeIndex firstUnused;             // chain of nodes to use again, through value[0]
+        DaBookVector<Node> nodes;
+        DaBookVector<std::uint8_t> counts;  // of entries, by node
+        NodeIndex firstUnused;              // chain of nodes to use again, through value[0]
     };
 
     /// For one alignment, by inner node: the longest request that each entry can take.
     struct Column {
         Word mask;
-        std::vector<Entries> fits;
+        DaBookVector<Entries> fits;
     };
 
     Word _origin;
     Pool _leaves;
     Pool _inners;
-    std::vector<Column> _columns;  // one for each alignment in use
+    DaBookVector<Column> _columns;  // one for each alignment in use
     NodeIndex _root;
     unsigned _rootLevel = 0;
     std::size_t _nbBlocks = 0;
@@ -117,7 +119,7 @@ private:
     }
     NodeIndex takeNode(unsigned level) noexcept;
     void returnNode(unsigned level, NodeIndex) noexcept;
-    Word summaryOf(const Column&, unsigned level, NodeIndex) const noexcept;
+    Word summaryOf(const Column&, unsigned level, NodeIndex, unsigned except) const noexcept;
     void fillColumn(Column&, unsigned level, NodeIndex) const noexcept;
     void carryAddressUp(const Position&) noexcept;
     void carryFitUp(Column&, const Position&, Word fitBefore, Word fit) noexcept;
