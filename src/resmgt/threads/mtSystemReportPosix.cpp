@@ -49,6 +49,7 @@ MtSystemReport MtSystemReport::take() {
     MtSystemReport report;
     report.processorArchitecture = 9;
     report.processorType = 8664;
+    report.platformId = 0;
     readProcessor(report);
     report.pageSize = ::sysconf(_SC_PAGESIZE);
     report.allocationGranularity = report.pageSize;
