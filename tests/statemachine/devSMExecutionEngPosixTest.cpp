@@ -1,4 +1,6 @@
+#include <gtest/gtest.h>
 #include <pthread.h>
+#include <thread>
 
 #include "devMgrEx.h"
 #include "devSMTestMachine.h"

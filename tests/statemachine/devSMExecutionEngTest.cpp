@@ -1,4 +1,6 @@
 #include <atomic>
+#include <gtest/gtest.h>
+#include <sstream>
 #include <thread>
 
 #include "devMgrEx.h"

@@ -1,6 +1,8 @@
 // Expanded machines beside an interpreter of the description they come from: whatever transitions
 // and conditions do, and whatever is posted when, both go the same way.
+#include <algorithm>
 #include <deque>
+#include <gtest/gtest.h>
 #include <random>
 
 #include "devMgrEx.h"

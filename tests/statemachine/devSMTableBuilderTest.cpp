@@ -1,3 +1,6 @@
+#include <gtest/gtest.h>
+#include <sstream>
+
 #include "devMgrEx.h"
 #include "devSeqSMDescription.h"
 #include "expectThrows.h"

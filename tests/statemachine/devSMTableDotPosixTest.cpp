@@ -1,4 +1,7 @@
 #include <cstdio>
+#include <cstdlib>
+#include <gtest/gtest.h>
+#include <sstream>
 #include <sys/wait.h>
 
 #include "devSeqSMDescription.h"

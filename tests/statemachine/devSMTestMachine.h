@@ -1,10 +1,12 @@
 #pragma once
 
 #include <functional>
+#include <gtest/gtest.h>
 #include <map>
 #include <memory>
 #include <set>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "devSMConditionalTransition.h"

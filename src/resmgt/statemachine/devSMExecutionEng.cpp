@@ -34,6 +34,8 @@ DevSMExecutionEng::DevSMExecutionEng(RCShdPtr<DevSMTable> table, DevSMTransition
     : _table(std::move(table)),
       _state(initialState),
       _nbEvents(static_cast<unsigned>(_table->getEvents().size())),
+      _nbDeclaredStates(static_cast<unsigned>(_table->getData().primaryStates.size())),
+      _nbDeclaredEvents(static_cast<unsigned>(_table->getData().primaryEvents.size())),
       _steps(_table->getProgram().getSteps()) {
     const auto nbStates = static_cast<int>(_table->getStates().size());
     if (initialState < 0 || initialState >= nbStates)
@@ -93,7 +95,9 @@ void DevSMExecutionEng::postOtherwise(unsigned event) {
 }
 
 void DevSMExecutionEng::execute(unsigned event) {
-    const DevSMStep step = _steps[toSize(_state) * _nbEvents + event];
+    if (static_cast<unsigned>(_state) >= _nbDeclaredStates || event >= _nbDeclaredEvents)
+        return executeStepByStep(event);
+    const DevSMStep step = _steps[toSize(_state) * _nbDeclaredEvents + event];
     if (step.transition == NONE) return executeStepByStep(event);
     const auto transition = static_cast<unsigned>(step.transition);
     try {

@@ -81,9 +81,11 @@ private:
     int _errorCode = NO_ERROR_CODE;
     Mode _mode = Mode::READY;
 
-    // Of the table, at hand for the common case.
-    unsigned _nbEvents = 0;
-    const DevSMStep* _steps = nullptr;
+    // Of the table, at hand for the common case: a declared event in a declared state.
+    unsigned _nbEvents;
+    unsigned _nbDeclaredStates;
+    unsigned _nbDeclaredEvents;
+    const DevSMStep* _steps;
 
     // The event being executed, and the last fault.
     int _originState = -1;

@@ -145,13 +145,10 @@ void DevSMProgram::addOutcomes(Choice& choice, const DevSMCondition* description
 }
 
 void DevSMProgram::findSteps() {
-    const std::size_t nbEvents = _data.events.size();
-    _steps.resize(_data.states.size() * nbEvents);
+    _steps.reserve(_data.primaryStates.size() * _data.primaryEvents.size());
     for (int state = 0; state < sizeOf(_data.primaryStates); ++state) {
-        DevSMStep* const row = _steps.data() + static_cast<std::size_t>(state) * nbEvents;
-        for (int event = 0; event < sizeOf(_data.primaryEvents); ++event) {
-            row[event] = makeStep(state, event);
-        }
+        for (int event = 0; event < sizeOf(_data.primaryEvents); ++event)
+            _steps.push_back(makeStep(state, event));
     }
 }
 

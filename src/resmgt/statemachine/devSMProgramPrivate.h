@@ -49,7 +49,7 @@ public:
 
     const std::vector<std::pair<int, Choice>>& getChoices() const noexcept { return _choices; }
 
-    /// Row by row, one entry for each state and event.
+    /// Row by row, one entry for each declared state and event.
     const DevSMStep* getSteps() const noexcept { return _steps.data(); }
 
     bool isTerminal(int state) const noexcept {
