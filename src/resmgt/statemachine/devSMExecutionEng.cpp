@@ -36,13 +36,13 @@ DevSMExecutionEng::DevSMExecutionEng(RCShdPtr<DevSMTable> table, DevSMTransition
       _nbEvents(static_cast<unsigned>(_table->getEvents().size())),
       _nbDeclaredStates(static_cast<unsigned>(_table->getData().primaryStates.size())),
       _nbDeclaredEvents(static_cast<unsigned>(_table->getData().primaryEvents.size())),
-      _steps(_table->getProgram().getSteps()) {
+      _steps(_table->_program->getSteps()) {
     const auto nbStates = static_cast<int>(_table->getStates().size());
     if (initialState < 0 || initialState >= nbStates)
         throw DevMgrEx::SMDomainError(ORV_FILE, __LINE__);
     createTransitions(factory);
-    if (!_table->getProgram().isConsistent()) throw DevMgrEx::SMBadImp(ORV_FILE, __LINE__);
-    if (_table->getProgram().isTerminal(initialState)) _mode = Mode::ENDED;
+    if (!_table->_program->isConsistent()) throw DevMgrEx::SMBadImp(ORV_FILE, __LINE__);
+    if (_table->_program->isTerminal(initialState)) _mode = Mode::ENDED;
 }
 
 DevSMExecutionEng::~DevSMExecutionEng() = default;
@@ -53,7 +53,7 @@ void DevSMExecutionEng::createTransitions(DevSMTransitionFactory& factory) {
     for (unsigned i = 0; i < nbTransitions; ++i) {
         _transitions.push_back(createTransition(factory, i));
     }
-    for (const auto& [transition, choice] : _table->getProgram().getChoices()) {
+    for (const auto& [transition, choice] : _table->_program->getChoices()) {
         const auto decider = toSize(choice.transition);
         RCShdPtr<DevSMTransition>& object = _transitions[toSize(transition)];
         object = RCShdPtr<DevSMConditionalTransition>::dynamicCast(_transitions[decider]);
@@ -63,7 +63,7 @@ void DevSMExecutionEng::createTransitions(DevSMTransitionFactory& factory) {
 
 RCShdPtr<DevSMTransition> DevSMExecutionEng::createTransition(DevSMTransitionFactory& factory,
                                                               unsigned transition) const {
-    const DevSMProgram& program = _table->getProgram();
+    const DevSMProgram& program = *_table->_program;
     const auto index = static_cast<int>(transition);
     if (index == program.illegalTransition || index == program.exceptionTransition ||
         index == program.noExceptionTransition)
@@ -110,7 +110,7 @@ void DevSMExecutionEng::execute(unsigned event) {
         _originEvent = static_cast<int>(event);
         keepCurrentException();
         _state = _table->getNextState(_state, transition);
-        take(_table->getProgram().exceptionTransition, nullptr);
+        take(_table->_program->exceptionTransition, nullptr);
         return arrive();
     }
     _state = step.nextState;
@@ -145,7 +145,7 @@ bool DevSMExecutionEng::take(int transition, int* chosen) {
     if (_transitions[index].isNull()) stopAsBadImplementation("A transition has no object.");
     const bool hasCompleted = run(transition, chosen);
     advance(transition);
-    const DevSMProgram& program = _table->getProgram();
+    const DevSMProgram& program = *_table->_program;
     if (program.isChecked(index)) {
         const int event = hasCompleted ? program.noExceptionEvent : program.exceptionEvent;
         take(lookUpTransition(static_cast<unsigned>(event)), nullptr);
@@ -156,7 +156,7 @@ bool DevSMExecutionEng::take(int transition, int* chosen) {
 // False if the transition threw and that is an event of the machine.
 bool DevSMExecutionEng::run(int transition, int* chosen) {
     DevSMTransition& object = *_transitions[toSize(transition)];
-    const DevSMProgram& program = _table->getProgram();
+    const DevSMProgram& program = *_table->_program;
     const bool isChecked = program.isChecked(toSize(transition));
     LiString outcome;
     const DevSMProgram::Choice* const choice = program.findChoice(transition);
@@ -198,7 +198,7 @@ void DevSMExecutionEng::advance(int transition) {
 
 // The end of an event: is it also that of the machine?
 void DevSMExecutionEng::arrive() {
-    const DevSMProgram& program = _table->getProgram();
+    const DevSMProgram& program = *_table->_program;
     if (!program.isTerminal(_state)) return;
     _mode = Mode::ENDED;
     _pending.clear();
@@ -239,10 +239,9 @@ void DevSMExecutionEng::stopAsBadImplementation(std::string_view why, std::strin
     throw DevMgrEx::SMBadImp(ORV_FILE, __LINE__);
 }
 
-const LiString& DevSMExecutionEng::getStateName() const {
-    static const LiString none("?");
+LiString DevSMExecutionEng::getStateName() const {
     const std::vector<LiString>& states = _table->getStates();
-    return toSize(_state) < states.size() ? states[toSize(_state)] : none;
+    return toSize(_state) < states.size() ? states[toSize(_state)] : "?";
 }
 
 void DevSMExecutionEng::dump(std::ostream& stream) const {
@@ -256,7 +255,7 @@ void DevSMExecutionEng::dump(std::ostream& stream) const {
     for (std::size_t i = 0; i < _transitions.size(); ++i) {
         const LiString& name = _table->getTransitions()[i];
         stream << i << '\t';
-        if (_table->getProgram().isChecked(i)) {
+        if (_table->_program->isChecked(i)) {
             stream << "ExEngPrimary( " << name << " )";
         } else {
             stream << name << (_transitions[i].isNull() ? " (no object)" : "");

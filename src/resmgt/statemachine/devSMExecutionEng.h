@@ -21,7 +21,7 @@ struct DevSMStep;
 /// both end the machine. What contradicts the table stops it with an error code. In these cases
 /// events still pending are dropped, and getFaultText() tells what happened.
 ///
-/// - Threads: driven by one thread at a time; it has no lock.
+/// - Threads: driven by one thread at a time; it has no lock. A transition does not destroy it.
 /// - Ownership: shares the table and the transitions; the factory is used by the constructor only.
 class ORV_RESMGT_API DevSMExecutionEng {
 public:
@@ -53,7 +53,7 @@ public:
 
     /// Inside a transition the state being left; between events a declared one, "_ill" or "_exc".
     int getState() const noexcept { return _state; }
-    const LiString& getStateName() const;
+    LiString getStateName() const;  ///< "?" where a bad table has led nowhere.
     int getErrorCode() const noexcept { return _errorCode; }
 
     /// Would postEvent() accept an event?

@@ -61,10 +61,9 @@ public:
     /// condition chooses is dashed, what only an exception leads to is dotted.
     void toDot(std::ostream&, Detail = Detail::PRIMARY) const;
 
-    /// For the engine.
-    const DevSMProgram& getProgram() const noexcept { return *_program; }
-
 private:
+    friend class DevSMExecutionEng;
+
     DevSMTableData _data;
     std::unique_ptr<const DevSMProgram> _program;  // never null
 

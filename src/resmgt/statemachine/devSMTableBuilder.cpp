@@ -33,16 +33,16 @@ public:
     Expander(const DevSMMachine& declared, const std::set<int>& conditionalTransitions)
         : _declared(declared),
           _conditionalTransitions(conditionalTransitions),
-          sm(std::make_unique<DevSMMachine>()) {}
+          _sm(std::make_unique<DevSMMachine>()) {}
 
     std::unique_ptr<DevSMMachine> expand() {
         addNames();
         forEachPair(&Expander::expandPair);
-        _firstCheckState = sm->states.getSize();
+        _firstCheckState = _sm->states.getSize();
         forEachPair(&Expander::checkPair);
-        ORV_ASSERT_TEXT(sm->transitions.find(DevSMReserved::ILLEGAL) == _illegal,
+        ORV_ASSERT_TEXT(_sm->transitions.find(DevSMReserved::ILLEGAL) == _illegal,
                         "isTransition(_illegal)");
-        return std::move(sm);
+        return std::move(_sm);
     }
 
 private:
@@ -55,7 +55,7 @@ private:
 
     const DevSMMachine& _declared;
     const std::set<int>& _conditionalTransitions;
-    std::unique_ptr<DevSMMachine> sm;
+    std::unique_ptr<DevSMMachine> _sm;  // the expanded machine
     int _firstCheckState = 0;
     std::vector<Condition> _conditions;  // in the order of their pairs
     std::size_t _nbCheckedConditions = 0;
@@ -64,16 +64,16 @@ private:
     int _noExceptionEvent = NONE, _noException = NONE;
 
     void addNames() {
-        for (const LiString& name : _declared.states.getNames()) sm->addState(name);
-        for (const LiString& name : _declared.events.getNames()) sm->events.add(name);
-        for (const LiString& name : _declared.transitions.getNames()) sm->transitions.add(name);
-        sm->addState(DevSMReserved::ILLEGAL);
-        _exceptionState = sm->addState(DevSMReserved::EXCEPTION);
-        _exceptionEvent = sm->events.add(DevSMReserved::EXCEPTION);
-        _noExceptionEvent = sm->events.add(DevSMReserved::NO_EXCEPTION);
-        _illegal = sm->transitions.add(DevSMReserved::ILLEGAL);
-        _exception = sm->transitions.add(DevSMReserved::EXCEPTION);
-        _noException = sm->transitions.add(DevSMReserved::NO_EXCEPTION);
+        for (const LiString& name : _declared.states.getNames()) _sm->addState(name);
+        for (const LiString& name : _declared.events.getNames()) _sm->events.add(name);
+        for (const LiString& name : _declared.transitions.getNames()) _sm->transitions.add(name);
+        _sm->addState(DevSMReserved::ILLEGAL);
+        _exceptionState = _sm->addState(DevSMReserved::EXCEPTION);
+        _exceptionEvent = _sm->events.add(DevSMReserved::EXCEPTION);
+        _noExceptionEvent = _sm->events.add(DevSMReserved::NO_EXCEPTION);
+        _illegal = _sm->transitions.add(DevSMReserved::ILLEGAL);
+        _exception = _sm->transitions.add(DevSMReserved::EXCEPTION);
+        _noException = _sm->transitions.add(DevSMReserved::NO_EXCEPTION);
     }
 
     void forEachPair(void (Expander::*action)(int state, int event, const Transitions&)) {
@@ -95,31 +95,32 @@ private:
     void expandPair(int s, int e, const Transitions& tv) {
         if (isConditional(tv)) return expandConditionalPair(s, e, tv);
         ORV_ASSERT(1 == tv.size());
-        ORV_ASSERT(!sm->isAssociatedStateEvent(s, e));
-        sm->associate(s, e, tv[0]);
+        ORV_ASSERT_TEXT(!_sm->isAssociatedStateEvent(s, e), "!sm->isAssociatedStateEvent(s, e)");
+        _sm->associate(s, e, tv[0]);
         const int nextState = findNext(s, tv[0]);
-        if (sm->isAssociatedStateTransition(s, tv[0])) {
-            ORV_ASSERT(nextState == sm->getState(s, tv[0]));
+        if (_sm->isAssociatedStateTransition(s, tv[0])) {
+            ORV_ASSERT_TEXT(nextState == _sm->getState(s, tv[0]),
+                            "nextState == sm->getState(s, tv[0])");
         } else {
-            sm->associateNext(s, tv[0], nextState);
+            _sm->associateNext(s, tv[0], nextState);
         }
     }
 
     void expandConditionalPair(int s, int e, const Transitions& tv) {
         const LiString tag = "(" + _declared.states[s] + ":" + _declared.events[e] + ")";
         Condition condition;
-        condition.state = sm->addState(DevSMReserved::CONDITION_STATE + tag);
-        condition.event = sm->events.add(DevSMReserved::CONDITION_EVENT + tag);
-        condition.transition = sm->transitions.add(DevSMReserved::CONDITION_TRANSITION + tag);
-        sm->associate(s, e, condition.transition);
-        sm->associateNext(s, condition.transition, condition.state);
-        ORV_ASSERT_TEXT(!sm->isAssociatedStateEvent(condition.state, condition.event),
+        condition.state = _sm->addState(DevSMReserved::CONDITION_STATE + tag);
+        condition.event = _sm->events.add(DevSMReserved::CONDITION_EVENT + tag);
+        condition.transition = _sm->transitions.add(DevSMReserved::CONDITION_TRANSITION + tag);
+        _sm->associate(s, e, condition.transition);
+        _sm->associateNext(s, condition.transition, condition.state);
+        ORV_ASSERT_TEXT(!_sm->isAssociatedStateEvent(condition.state, condition.event),
                         "!sm->isAssociatedStateEvent(condStateName,condEventName)");
-        sm->associate(condition.state, condition.event, tv[0]);
+        _sm->associate(condition.state, condition.event, tv[0]);
         for (const DevSMRow::Entry& entry : tv) {
-            ORV_ASSERT_TEXT(!sm->isAssociatedStateTransition(condition.state, entry.value),
+            ORV_ASSERT_TEXT(!_sm->isAssociatedStateTransition(condition.state, entry.value),
                             "!sm->isAssociatedStateTransition(condStateName,t)");
-            sm->associateNext(condition.state, entry.value, findNext(s, entry.value));
+            _sm->associateNext(condition.state, entry.value, findNext(s, entry.value));
         }
         _conditions.push_back(condition);
     }
@@ -147,21 +148,21 @@ private:
     }
 
     void addCheck(int s, int e, int t, int onException) {
-        const int check = sm->addState(DevSMReserved::EXCEPTION_CHECK + ("(" + sm->states[s]) +
-                                       ":" + sm->events[e] + ":" + sm->transitions[t] + ")");
-        int nextState = sm->getState(s, t);
+        const int check = _sm->addState(DevSMReserved::EXCEPTION_CHECK + ("(" + _sm->states[s]) +
+                                        ":" + _sm->events[e] + ":" + _sm->transitions[t] + ")");
+        int nextState = _sm->getState(s, t);
         if (nextState < _firstCheckState) {
-            sm->redirect(s, t, check);
+            _sm->redirect(s, t, check);
         } else {
-            nextState =
-                sm->getState(nextState, _noException);  // another event shares the transition
+            // Another event of the state shares the transition and has its check already.
+            nextState = _sm->getState(nextState, _noException);
         }
-        sm->associate(check, _exceptionEvent, _exception);
-        sm->associate(check, _noExceptionEvent, _noException);
-        sm->associateNext(check, _exception, onException);
-        ORV_ASSERT_TEXT(!sm->isAssociatedStateTransition(check, _noException),
+        _sm->associate(check, _exceptionEvent, _exception);
+        _sm->associate(check, _noExceptionEvent, _noException);
+        _sm->associateNext(check, _exception, onException);
+        ORV_ASSERT_TEXT(!_sm->isAssociatedStateTransition(check, _noException),
                         "!isAssociatedStateTransition(exchkStateName, _noException)");
-        sm->associateNext(check, _noException, nextState);
+        _sm->associateNext(check, _noException, nextState);
     }
 };
 
