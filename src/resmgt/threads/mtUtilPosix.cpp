@@ -9,6 +9,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include "envVar.h"
 #include "mtUtil.h"
 #include "osError.h"
 #include "trace.h"
@@ -23,8 +24,7 @@ void printError(const char* step) {
 
 /// A file without a name in the temporary folder; below 0 if there is none to be had.
 int openProbeFile() {
-    const char* const folder = std::getenv("TMPDIR");
-    std::string path = std::string(folder != nullptr ? folder : "/tmp") + "/orvProbeXXXXXX";
+    std::string path = EnvVar("TMPDIR").getText().value_or("/tmp") + "/orvProbeXXXXXX";
     const int file = ::mkostemp(path.data(), O_CLOEXEC);
     if (file >= 0) ::unlink(path.c_str());
     return file;
