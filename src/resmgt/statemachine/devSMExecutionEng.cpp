@@ -110,7 +110,7 @@ void DevSMExecutionEng::execute(unsigned event) {
         _originEvent = static_cast<int>(event);
         keepCurrentException();
         _state = _table->getNextState(_state, transition);
-        take(_table->_program->exceptionTransition, nullptr);
+        take(_table->_program->exceptionTransition);
         return arrive();
     }
     _state = step.nextState;
@@ -119,10 +119,9 @@ void DevSMExecutionEng::execute(unsigned event) {
 void DevSMExecutionEng::executeStepByStep(unsigned event) {
     _originState = _state;
     _originEvent = static_cast<int>(event);
-    int chosen = NONE;
-    take(lookUpTransition(event), &chosen);
+    const int chosen = take(lookUpTransition(event));
     // In the condition state now: its event takes the chosen transition.
-    if (chosen != NONE) take(chosen, nullptr);
+    if (chosen != NONE) take(chosen);
     arrive();
 }
 
@@ -136,25 +135,26 @@ int DevSMExecutionEng::lookUpTransition(unsigned event) {
     }
 }
 
-// Takes the transition and, where a check follows it, the continuation. The choice of a condition
-// that did not throw goes to `chosen`.
-bool DevSMExecutionEng::take(int transition, int* chosen) {
+// Takes the transition and, where a check follows it, the continuation. Returns what was chosen if
+// the transition asks a condition and that did not throw, else NONE.
+int DevSMExecutionEng::take(int transition) {
     const auto index = toSize(transition);
     if (index >= _table->getTransitions().size())
         stopAsBadImplementation("The table names no such transition.");
     if (_transitions[index].isNull()) stopAsBadImplementation("A transition has no object.");
+    int chosen = NONE;
     const bool hasCompleted = run(transition, chosen);
     advance(transition);
     const DevSMProgram& program = *_table->_program;
     if (program.isChecked(index)) {
         const int event = hasCompleted ? program.noExceptionEvent : program.exceptionEvent;
-        take(lookUpTransition(static_cast<unsigned>(event)), nullptr);
+        take(lookUpTransition(static_cast<unsigned>(event)));
     }
-    return hasCompleted;
+    return chosen;
 }
 
 // False if the transition threw and that is an event of the machine.
-bool DevSMExecutionEng::run(int transition, int* chosen) {
+bool DevSMExecutionEng::run(int transition, int& chosen) {
     DevSMTransition& object = *_transitions[toSize(transition)];
     const DevSMProgram& program = *_table->_program;
     const bool isChecked = program.isChecked(toSize(transition));
@@ -176,8 +176,8 @@ bool DevSMExecutionEng::run(int transition, int* chosen) {
         throw;
     }
     if (choice != nullptr) {
-        *chosen = choice->find(outcome);
-        if (*chosen == NONE) stopAsBadImplementation("A condition yields ", outcome.getText());
+        chosen = choice->find(outcome);
+        if (chosen == NONE) stopAsBadImplementation("A condition yields ", outcome.getText());
     }
     return true;
 }

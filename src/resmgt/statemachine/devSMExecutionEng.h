@@ -100,9 +100,8 @@ private:
     void execute(unsigned event);
     void executeStepByStep(unsigned event);
     int lookUpTransition(unsigned event);
-    bool take(int transition, int* chosen);
-    bool run(int transition, int* chosen);
-    int choose(int transition);
+    int take(int transition);
+    bool run(int transition, int& chosen);
     void advance(int transition);
     void arrive();
     void keepFault(std::string_view text, std::string_view detail = "") noexcept;
