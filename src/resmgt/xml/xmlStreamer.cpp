@@ -1,6 +1,10 @@
 #include "xmlStreamer.h"
 
+#include <array>
+#include <charconv>
 #include <exception>
+#include <locale>
+#include <type_traits>
 
 #include "assertions.h"
 #include "xmlEx.h"
@@ -19,8 +23,11 @@ XmlStreamer::XmlStreamer(std::ostream& output, bool writeDeclaration, const LiSt
 
 XmlStreamer::~XmlStreamer() noexcept(false) = default;
 
-XmlStreamer::NodeGuard::NodeGuard(NodeGuard& parent) : _output(parent._output) {
-    parent.setContent();
+XmlStreamer::NodeGuard::NodeGuard(NodeGuard& parent, const LiString& name)
+    : _output(parent._output) {
+    XmlOutput text(_output);
+    parent.setContent(text);
+    text.put("<").put(XmlText::viewOf(name)).put(" ").flush();
     _parent = &parent;
     _previous = parent._lastChild;
     if (_previous != nullptr) _previous->_next = this;
@@ -42,14 +49,10 @@ void XmlStreamer::NodeGuard::leaveParent() noexcept {
 }
 
 XmlStreamer::ElementGuard::ElementGuard(XmlStreamer& document, const LiString& name)
-    : NodeGuard(document._root), _name(name) {
-    open();
-}
+    : NodeGuard(document._root, name), _name(name) {}
 
 XmlStreamer::ElementGuard::ElementGuard(ElementGuard& parent, const LiString& name)
-    : NodeGuard(parent), _name(name) {
-    open();
-}
+    : NodeGuard(parent, name), _name(name) {}
 
 XmlStreamer::ElementGuard::~ElementGuard() noexcept(false) {
     const bool hadContent = hasContent();
@@ -62,10 +65,6 @@ XmlStreamer::ElementGuard::~ElementGuard() noexcept(false) {
     }
 }
 
-void XmlStreamer::ElementGuard::open() {
-    XmlOutput(_output).put("<").put(XmlText::viewOf(_name)).put(" ").flush();
-}
-
 void XmlStreamer::ElementGuard::close(bool hadContent) {
     XmlOutput text(_output);
     if (hadContent) {
@@ -76,10 +75,10 @@ void XmlStreamer::ElementGuard::close(bool hadContent) {
     text.flush();
 }
 
-void XmlStreamer::ElementGuard::setContent() {
+void XmlStreamer::ElementGuard::setContent(XmlOutput& output) {
     if (hasContent()) return;
     NodeGuard::setContent(true);
-    XmlOutput(_output).put(">\n").flush();
+    output.put(">\n");
 }
 
 void XmlStreamer::ElementGuard::checkStartTagIsOpen(const char* attribute) const {
@@ -98,12 +97,39 @@ void XmlStreamer::ElementGuard::addAttribute(const char* name, const LiString& v
     addAttribute(name, value.getChars());
 }
 
+namespace {
+
+/// Whether `stream << integer` writes plain decimal digits, as it does unless told otherwise.
+bool writesPlainIntegers(const std::ostream& stream) {
+    constexpr auto SIGN_AND_BASE = std::ios::showpos | std::ios::oct | std::ios::hex;
+    return (stream.flags() & SIGN_AND_BASE) == 0 && stream.width() == 0 &&
+           stream.getloc() == std::locale::classic();
+}
+
+/// Puts an integer, if the stream would not write it otherwise, without entering the stream.
+template <class T>
+bool putPlainInteger(XmlOutput& output, const std::ostream& stream, T value) {
+    if constexpr (std::is_integral_v<T>) {
+        if (!writesPlainIntegers(stream)) return false;
+        std::array<char, 24> digits;  // it has at most 20 characters
+        const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), value).ptr;
+        output.put({digits.data(), end});
+        return true;
+    }
+    return false;
+}
+
+}  // namespace
+
 template <class T>
 void XmlStreamer::ElementGuard::addNumber(const char* name, T value) {
     checkStartTagIsOpen(name);
     XmlOutput text(_output);
-    text.put(XmlText::viewOf(name)).put("=\"").flush();
-    _output << value;
+    text.put(XmlText::viewOf(name)).put("=\"");
+    if (!putPlainInteger(text, _output, value)) {
+        text.flush();
+        _output << value;
+    }
     text.put("\" ").flush();
 }
 
@@ -130,13 +156,15 @@ void XmlStreamer::ElementGuard::addAttribute(const char* name, double value) {
 }
 
 void XmlStreamer::ElementGuard::addTextData(const char* text) {
-    setContent();
-    XmlOutput(_output).put(XmlText::viewOf(text)).flush();
+    XmlOutput output(_output);
+    setContent(output);
+    output.put(XmlText::viewOf(text)).flush();
 }
 
 void XmlStreamer::ElementGuard::addCharacterData(const char* text) {
-    setContent();
-    XmlOutput(_output).put("<![CDATA[").put(XmlText::viewOf(text)).put("]]").flush();
+    XmlOutput output(_output);
+    setContent(output);
+    output.put("<![CDATA[").put(XmlText::viewOf(text)).put("]]").flush();
 }
 
 }  // namespace Orv

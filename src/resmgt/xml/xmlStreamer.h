@@ -6,6 +6,8 @@
 
 namespace Orv {
 
+class XmlOutput;
+
 /// Writes XML straight to a stream: an ElementGuard opens an element and closes it when it goes, so
 /// the nesting of guards is that of the document. To write a tree of objects take XmlWriter.
 ///
@@ -37,7 +39,8 @@ public:
         bool hasContent() const noexcept { return _hasContent; }  ///< Anything after its start tag.
 
     protected:
-        explicit NodeGuard(NodeGuard& parent);
+        /// Tells the parent that it has content, and writes the beginning of the start tag.
+        NodeGuard(NodeGuard& parent, const LiString& name);
         virtual ~NodeGuard() noexcept(false);
 
         void setContent(bool hasContent) noexcept { _hasContent = hasContent; }
@@ -49,8 +52,8 @@ public:
 
         explicit NodeGuard(std::ostream& output) noexcept : _output(output) {}
 
-        /// Called by a child that opens.
-        virtual void setContent() { setContent(true); }
+        /// Called by a child that opens; an element writes the end of its start tag.
+        virtual void setContent(XmlOutput&) { setContent(true); }
 
         void leaveParent() noexcept;
 
@@ -94,8 +97,7 @@ public:
     private:
         const LiString _name;
 
-        void setContent() override;
-        void open();
+        void setContent(XmlOutput& output) override;
         void close(bool hadContent);
         void checkStartTagIsOpen(const char* attribute) const;
 
