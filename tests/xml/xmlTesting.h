@@ -3,11 +3,13 @@
 #include <algorithm>
 #include <cstddef>
 #include <gtest/gtest.h>
+#include <iterator>
 #include <mutex>
 #include <random>
 #include <stdexcept>
 #include <streambuf>
 #include <string>
+#include <utility>
 
 #include "lgSink.h"
 #include "traceManager.h"
@@ -88,8 +90,11 @@ public:
         return std::uniform_int_distribution<unsigned>(0, end - 1)(_engine);
     }
 
-    /// Characters 0x20 to 0x7E and, if wanted, any others of Unicode that XML allows, as UTF-8.
+    /// Characters 0x20 to 0x7E and, if wanted, such of Unicode that need two to four bytes.
     std::string text(unsigned nbCharacters, bool isAscii) {
+        // The first and last ones of each length that XML allows.
+        static const char* const LONG[] = {"\u00A0", "\u07FF",     "\u0800",     "\uD7FF",
+                                           "\uE000", "\U0000FFFD", "\U00010000", "\U0010FFFF"};
         std::string result;
         for (unsigned i = 0; i < nbCharacters; ++i) {
             if (below(4) == 0) {
@@ -97,7 +102,7 @@ public:
             } else if (isAscii || below(2) == 0) {
                 result += static_cast<char>(0x20 + below(0x7F - 0x20));
             } else {
-                appendUtf8(result);
+                result += LONG[below(std::size(LONG))];
             }
         }
         return result;
@@ -105,45 +110,18 @@ public:
 
 private:
     std::mt19937 _engine;
-
-    void appendUtf8(std::string& text) {
-        static constexpr unsigned RANGES[][2] = {
-            {0xA0, 0x7FF}, {0x800, 0xD7FF}, {0xE000, 0xFFFD}, {0x10000, 0x10FFFF}};
-        const auto [first, last] = RANGES[below(4)];
-        const unsigned code = first + below(last - first + 1);
-        const auto put = [&](unsigned bits) { text += static_cast<char>(bits); };
-        if (code < 0x800) {
-            put(0xC0 | code >> 6);
-        } else {
-            if (code < 0x10000) {
-                put(0xE0 | code >> 12);
-            } else {
-                put(0xF0 | code >> 18);
-                put(0x80 | (code >> 12 & 0x3F));
-            }
-            put(0x80 | (code >> 6 & 0x3F));
-        }
-        put(0x80 | (code & 0x3F));
-    }
 };
 
 /// The escaped form, made the simplest way.
 inline std::string xmlEscaped(const std::string& text) {
+    static const std::pair<char, const char*> ENTITIES[] = {
+        {'"', "&quot;"}, {'&', "&amp;"}, {'\'', "&apos;"}, {'<', "&lt;"}, {'>', "&gt;"}};
     std::string result;
     for (const char character : text) {
-        if (character == '"') {
-            result += "&quot;";
-        } else if (character == '&') {
-            result += "&amp;";
-        } else if (character == '\'') {
-            result += "&apos;";
-        } else if (character == '<') {
-            result += "&lt;";
-        } else if (character == '>') {
-            result += "&gt;";
-        } else {
-            result += character;
-        }
+        std::string piece(1, character);
+        for (const auto& [special, entity] : ENTITIES)
+            if (character == special) piece = entity;
+        result += piece;
     }
     return result;
 }
