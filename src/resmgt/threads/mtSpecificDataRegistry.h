@@ -7,11 +7,11 @@
 #include "lkRecLock.h"
 #include "resmgtApi.h"
 #include "threadSafety.h"
+#include "threadSlot.h"
 
 namespace Orv {
 
 class MtOpaqueData;
-class ThreadSlot;
 
 /// Which slots hold a value for which thread, so that each value is deleted once: when its thread
 /// ends or when its slot goes. One for the process, never destroyed.
@@ -52,6 +52,8 @@ private:
     };
     using Entries = std::multimap<std::uintptr_t, Entry>;
 
+    static ThreadSlot _ownNumber;  // each thread's
+
     mutable LkRecLock _lock{"MtSpecificDataRegistry"};
     Entries _entries ORV_GUARDED_BY(_lock);
 
@@ -60,7 +62,6 @@ private:
     void removeThread(std::uintptr_t number);
     bool removeFirst(std::uintptr_t number);
     static void noticeEnd(void* number) noexcept;
-    static ThreadSlot& getSlot();
 };
 
 }  // namespace Orv

@@ -30,7 +30,7 @@ struct MtThread::Frame {
     std::exception_ptr thrown{};          // the first of all
     ObjPtr<MtThreadProtocol> orphaned{};  // of an object that has gone
 
-    ~Frame() { getSlot().set(nullptr); }
+    ~Frame() { current.set(nullptr); }
 
     /// Does a step of the end. Only the C library's own unwinding keeps it from the next one.
     template <class Step>
@@ -44,11 +44,9 @@ struct MtThread::Frame {
         }
     }
 
-    static ThreadSlot& getSlot() {
-        static auto& slot = *new ThreadSlot(ThreadSlot::THREADS);
-        return slot;
-    }
-    static Frame* find() noexcept { return static_cast<Frame*>(getSlot().get()); }
+    static Frame* find() noexcept { return static_cast<Frame*>(current.get()); }
+
+    static constinit inline ThreadSlot current{ThreadSlot::THREADS};
 };
 
 namespace {
@@ -115,7 +113,7 @@ void MtThread::adoptCurrentThread() {
     static Frame* const frame = new Frame{nullptr};
     _native->adoptCurrent();
     frame->thread = this;
-    Frame::getSlot().set(frame);
+    Frame::current.set(frame);
     LgRegistry::getInstance().registerThread(_name.getText());
     _isRunning.store(true, std::memory_order_release);
 }
@@ -290,7 +288,7 @@ bool MtThread::enter(Frame& frame) noexcept {
     try {
         _native->enter();
         _isCancelRequested.store(false, std::memory_order_relaxed);
-        Frame::getSlot().set(&frame);
+        Frame::current.set(&frame);
         _dataNumber = MtSpecificDataRegistry::getThreadNumber();
         LgRegistry::getInstance().registerThread(_name.getText());
         _native->setName(_name.getChars());
