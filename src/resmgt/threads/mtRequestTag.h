@@ -23,6 +23,8 @@ public:
     /// Names a count that was not released, through this copy or another one.
     bool isValid() const noexcept;
 
+    bool isNull() const noexcept { return _id.isNull(); }  ///< Has never named anything.
+
     bool operator==(const MtRequestTag& other) const noexcept { return _id == other._id; }
 
 private:
