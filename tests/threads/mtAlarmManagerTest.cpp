@@ -79,7 +79,6 @@ TEST(MtAlarmManager, firesOnceAtItsTimeAndNeverBefore) {
         Recorder recorder;
         const Handle handle = makeHandle(recorder, duration);
         ASSERT_TRUE(manager.registerAlarm(handle));
-        EXPECT_FALSE(manager.registerAlarm(handle) && handle->hasOccurred());
         ASSERT_TRUE(recorder.nbCalls.waitFor(1));
         manager.deregisterAlarm(handle);
         ASSERT_GE(recorder.calls.size(), 1U);
@@ -146,20 +145,17 @@ TEST(MtAlarmManager, amongEqualTimesTheOneRegisteredLastComesFirst) {
     MtAlarmManagerImp manager;
     Holdup holdup(manager);
     std::vector<int> order;
-    TestCounter nbCalls;
     std::vector<std::unique_ptr<Recorder>> recorders;
     const double time = MtAlarmManager::getTime();
     for (int i = 0; i < 5; ++i) {
-        recorders.push_back(std::make_unique<Recorder>([&, i](const Handle&, bool) {
-            order.push_back(i);
-            nbCalls.add();
-        }));
+        recorders.push_back(
+            std::make_unique<Recorder>([&order, i](const Handle&, bool) { order.push_back(i); }));
         const Handle handle = makeHandle(*recorders.back(), 0);
         handle->setAlarmTime(i == 2 ? time - 1 : time);
         ASSERT_TRUE(manager.registerAlarm(handle));
     }
     holdup.end();
-    ASSERT_TRUE(nbCalls.waitFor(5));
+    for (const auto& recorder : recorders) ASSERT_TRUE(recorder->nbCalls.waitFor(1));
     EXPECT_EQ(order, (std::vector<int>{2, 4, 3, 1, 0}));
 }
 

@@ -121,20 +121,6 @@ TEST(MtTaskQueue, eachTaskReachesOneTakerWhoeverElseWaits) {
     EXPECT_EQ(nbRun, 2 * NB_TASKS);
 }
 
-TEST(MtTaskQueue, whoHasTakenATaskMayDestroyTheQueueDuringThePut) {
-    for (int round = 0; round < 2000; ++round) {
-        auto* const queue = new MtTaskQueue(1);
-        queue->open();
-        std::jthread taker([queue] {
-            MtTask task;
-            EXPECT_TRUE(queue->take(task));
-            delete queue;
-        });
-        MtTask task = MtTask::create(MtRequestTag(), [] {});
-        EXPECT_EQ(queue->put(task), MtTaskQueue::DONE);
-    }
-}
-
 }  // namespace
 
 }  // namespace Orv

@@ -83,7 +83,7 @@ bool MtAlarmHandle::hasOccurred() const {
 
 bool MtAlarmHandle::isRegistered() const {
     const LkGuard guard(_lock);
-    return _isRegistered;
+    return _isRegistered.load(std::memory_order_acquire);
 }
 
 bool MtAlarmHandle::prepareForRegistration(double now) {
@@ -94,18 +94,13 @@ bool MtAlarmHandle::prepareForRegistration(double now) {
     if (_requestedRepeats > 0 && !(std::isfinite(_repeatDuration) && _repeatDuration > 0)) {
         return false;
     }
-    _isRegistered = true;
+    _isRegistered.store(true, std::memory_order_relaxed);
     _timeRegistered = now;
     _alarmTime = alarmTime;
     if (!_isRelative) _duration = alarmTime - now;
     _hasOccurred = false;
     _repeatCount = 0;
     return true;
-}
-
-void MtAlarmHandle::setRegistered(bool isRegistered) {
-    const LkGuard guard(_lock);
-    _isRegistered = isRegistered;
 }
 
 void MtAlarmHandle::setRegisteredAlarmTime(double seconds) {
@@ -130,7 +125,7 @@ MtAlarmHandle::Firing MtAlarmHandle::prepareFiring(double now) {
     }
     // An alarm beyond all numbers would never come.
     const bool isLast = nbLeft == 0 || !std::isfinite(_alarmTime + _repeatDuration);
-    if (isLast) _isRegistered = false;
+    if (isLast) _isRegistered.store(false, std::memory_order_release);
     return {isLate, isLast};
 }
 

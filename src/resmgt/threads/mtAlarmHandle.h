@@ -1,5 +1,6 @@
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 
 #include "lkLock.h"
@@ -53,24 +54,25 @@ private:
         bool isLast;
     };
 
+    // Registering and deregistering touch the first cache line and the lock behind it, whatever
+    // else the handle holds: with many handles that is what they cost.
+    std::uint32_t _place;  // in the manager's queue; guarded by its mutex
+    std::uint32_t _requestedRepeats ORV_GUARDED_BY(_lock) = 0;
     double _timeRegistered ORV_GUARDED_BY(_lock) = 0;
     double _alarmTime ORV_GUARDED_BY(_lock) = 0;
     double _duration ORV_GUARDED_BY(_lock) = 0;
-    double _repeatDuration ORV_GUARDED_BY(_lock) = 0;
-    std::uint32_t _requestedRepeats ORV_GUARDED_BY(_lock) = 0;
-    std::uint32_t _repeatCount ORV_GUARDED_BY(_lock) = 0;
     Callback* _callback ORV_GUARDED_BY(_lock) = nullptr;
-    bool _isRegistered ORV_GUARDED_BY(_lock) = false;
+    std::atomic<bool> _isRegistered{false};  // set under the lock, reset by the manager without it
     bool _hasOccurred ORV_GUARDED_BY(_lock) = false;
     bool _isRelative ORV_GUARDED_BY(_lock) = false;
-    std::uint32_t _place;  // in the manager's queue; guarded by its mutex
+    std::uint32_t _repeatCount ORV_GUARDED_BY(_lock) = 0;
     const LkLock _lock{"MtAlarmHandle"};
+    double _repeatDuration ORV_GUARDED_BY(_lock) = 0;
 
     MtAlarmHandle();
 
     // For the manager:
     bool prepareForRegistration(double now);
-    void setRegistered(bool isRegistered);
     void setRegisteredAlarmTime(double seconds);
     Firing prepareFiring(double now);
     Callback& noteCall();

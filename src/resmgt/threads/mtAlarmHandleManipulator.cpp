@@ -6,10 +6,6 @@ bool MtAlarmHandleManipulator::prepareForRegistration(MtAlarmHandle& handle, dou
     return handle.prepareForRegistration(now);
 }
 
-void MtAlarmHandleManipulator::setRegistered(MtAlarmHandle& handle, bool isRegistered) {
-    handle.setRegistered(isRegistered);
-}
-
 void MtAlarmHandleManipulator::setRegisteredAlarmTime(MtAlarmHandle& handle, double seconds) {
     handle.setRegisteredAlarmTime(seconds);
 }

@@ -23,7 +23,14 @@ protected:
     ///   time that is not finite, or repeats without a repeat duration above 0.
     static bool prepareForRegistration(MtAlarmHandle& handle, double now);
 
-    static void setRegistered(MtAlarmHandle& handle, bool isRegistered);
+    /// Of a registered handle, whose time only the manager changes: spares the handle's lock.
+    static double getAlarmTime(const MtAlarmHandle& handle) noexcept ORV_NO_THREAD_SAFETY_ANALYSIS {
+        return handle._alarmTime;
+    }
+
+    static void setRegistered(MtAlarmHandle& handle, bool isRegistered) noexcept {
+        handle._isRegistered.store(isRegistered, std::memory_order_release);
+    }
 
     /// Also while registered, unlike setAlarmTime().
     static void setRegisteredAlarmTime(MtAlarmHandle& handle, double seconds);

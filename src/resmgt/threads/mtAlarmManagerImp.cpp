@@ -58,22 +58,25 @@ MtAlarmManagerImp::~MtAlarmManagerImp() {
 bool MtAlarmManagerImp::registerAlarm(const Handle& handle) {
     MtAlarmHandle& alarm = *handle;
     const double now = getTime();
-    const LkGuard guard(_mutex);
-    if (_isStopping || (_isLeaving && _fired == handle)) return false;
-    _queue.makeRoom();
-    if (!prepareForRegistration(alarm, now)) return false;
-    const double alarmTime = alarm.getAlarmTime();
-    setPlace(alarm, _queue.add(alarmTime, handle));
-    if (alarmTime < _wakeTime) wakeNoLock();
+    Sleeping sleeping = NOT;
+    {
+        const LkGuard guard(_mutex);
+        if (_isStopping || (_isLeaving && _fired == handle)) return false;
+        _queue.makeRoom();
+        if (!prepareForRegistration(alarm, now)) return false;
+        const double alarmTime = getAlarmTime(alarm);
+        setPlace(alarm, _queue.add(alarmTime, handle));
+        sleeping = prepareWakeNoLock(alarmTime);
+    }
+    wake(sleeping);
     return true;
 }
 
 void MtAlarmManagerImp::deregisterAlarm(const Handle& handle) {
     MtAlarmHandle& alarm = *handle;
-    const Handle held = handle;  // not the last reference, whoever else lets go meanwhile
     const LkGuard guard(_mutex);
     leaveNoLock(alarm);
-    if (_fired == held && !_thread->isCurrentThread()) awaitFiringEnd(guard);
+    if (_fired == handle && !_thread->isCurrentThread()) awaitFiringEnd(guard);
 }
 
 void MtAlarmManagerImp::leaveNoLock(MtAlarmHandle& handle) {
@@ -105,19 +108,27 @@ bool MtAlarmManagerImp::hasThreadEnded() noexcept {
 }
 
 void MtAlarmManagerImp::stop() {
-    const LkGuard guard(_mutex);
-    _isStopping = true;
-    wakeNoLock();
+    Sleeping sleeping = NOT;
+    {
+        const LkGuard guard(_mutex);
+        _isStopping = true;
+        sleeping = prepareWakeNoLock(AWAKE);
+    }
+    wake(sleeping);
 }
 
-void MtAlarmManagerImp::wakeNoLock() {
-    if (_wakeTime == AWAKE) return;
-    if (_wakeTime == NEVER) {
-        _waitCv.signal();
-    } else {
-        _sleeper.wake();
-    }
-    _wakeTime = AWAKE;
+/// Lets the alarm thread look at the queue at @p seconds, if it would not before.
+/// @return what the caller gives to wake() without the mutex, for which a thread that was woken
+///   would only have to wait.
+MtAlarmManagerImp::Sleeping MtAlarmManagerImp::prepareWakeNoLock(double seconds) {
+    if (seconds >= _wakeTime) return NOT;
+    _wakeTime = seconds;
+    return _sleeping;
+}
+
+void MtAlarmManagerImp::wake(Sleeping sleeping) {
+    if (sleeping == IDLE) _waitCv.signal();
+    if (sleeping == TIMED) _sleeper.wake();
 }
 
 // --- the alarm thread ---
@@ -129,7 +140,7 @@ void MtAlarmManagerImp::run() {
             case Step::END:
                 return;
             case Step::SLEEP:
-                sleepUntil(step.seconds);
+                _sleeper.sleepUntil(DtTimeMark() + step.seconds);
                 break;
             case Step::CALL:
                 call(step.handle, step.isLate);
@@ -140,14 +151,17 @@ void MtAlarmManagerImp::run() {
 
 MtAlarmManagerImp::Step MtAlarmManagerImp::findNextStep() {
     const LkGuard guard(_mutex);
+    _sleeping = IDLE;
     while (!_isStopping && _queue.isEmpty()) {
         _wakeTime = NEVER;
         _waitCv.wait(guard);
-        _wakeTime = AWAKE;
     }
+    _sleeping = NOT;
+    _wakeTime = AWAKE;
     if (_isStopping) return {.kind = Step::END};
     const double now = getTime();
     if (_queue.getFirstTime() > now) {
+        _sleeping = TIMED;
         _wakeTime = _queue.getFirstTime();
         return {.kind = Step::SLEEP, .seconds = _wakeTime};
     }
@@ -160,12 +174,6 @@ MtAlarmManagerImp::Step MtAlarmManagerImp::findNextStep() {
         setPlace(*_fired, MtAlarmQueue::NOWHERE);
     }
     return {.kind = Step::CALL, .handle = _fired, .isLate = firing.isLate};
-}
-
-void MtAlarmManagerImp::sleepUntil(double seconds) {
-    _sleeper.sleepUntil(DtTimeMark() + seconds);
-    const LkGuard guard(_mutex);
-    _wakeTime = AWAKE;
 }
 
 void MtAlarmManagerImp::call(const Handle& handle, bool isLate) {

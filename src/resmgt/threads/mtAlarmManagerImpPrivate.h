@@ -42,7 +42,10 @@ private:
         bool isLate = false;
     };
 
-    // When the alarm thread looks at the queue again, if it sleeps until then.
+    /// How the alarm thread sleeps, and so how it is woken.
+    enum Sleeping { NOT, IDLE, TIMED };
+
+    // When it looks at the queue again.
     static constexpr double NEVER = std::numeric_limits<double>::infinity();
     static constexpr double AWAKE = -NEVER;
 
@@ -54,6 +57,7 @@ private:
 
     MtAlarmQueue _queue ORV_GUARDED_BY(_mutex);
     double _wakeTime ORV_GUARDED_BY(_mutex) = AWAKE;
+    Sleeping _sleeping ORV_GUARDED_BY(_mutex) = NOT;
     bool _isStopping ORV_GUARDED_BY(_mutex) = false;
 
     Handle _fired ORV_GUARDED_BY(_mutex);             // empty if none is being fired
@@ -66,12 +70,12 @@ private:
 
     void run();
     Step findNextStep();
-    void sleepUntil(double seconds);
     void call(const Handle& handle, bool isLate);
     void finishFiring();
 
     void stop();
-    void wakeNoLock() ORV_REQUIRES(_mutex);
+    Sleeping prepareWakeNoLock(double seconds) ORV_REQUIRES(_mutex);
+    void wake(Sleeping sleeping);
     void leaveNoLock(MtAlarmHandle& handle) ORV_REQUIRES(_mutex);
     void awaitFiringEnd(const LkGuard<const LkMutex>& guard) ORV_REQUIRES(_mutex);
     bool hasThreadEnded() noexcept;

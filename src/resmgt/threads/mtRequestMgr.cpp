@@ -42,8 +42,13 @@ void MtRequestMgr::incRequestCount(const MtRequestTag& tag) {
 }
 
 void MtRequestMgr::decRequestCount(const MtRequestTag& tag) {
-    const LkGuard guard(_mutex);
-    tag.getRecord(*this).decrement();
+    RCShdPtr<MtRequestTag::Record> awaited;
+    {
+        const LkGuard guard(_mutex);
+        if (tag.getRecord(*this).decrement()) awaited = tag._id;
+    }
+    // Without the mutex: a thread that is woken would only have to wait for it.
+    if (awaited) awaited->pulse();
 }
 
 unsigned MtRequestMgr::getRequestCount(const MtRequestTag& tag) const {

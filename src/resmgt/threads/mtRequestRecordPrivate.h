@@ -24,7 +24,10 @@ public:
     unsigned getCount() const noexcept { return _count; }
 
     void increment();
-    void decrement();
+
+    /// @return true if the count has come to 0 and somebody may wait for that: pulse() is to follow.
+    bool decrement();
+    void pulse() { _requestZero->pulse(); }  ///< Needs no mutex.
 
     /// Waits until the count comes to 0, even if it rises again at once.
     /// @return false if the time ran out.

@@ -31,11 +31,11 @@ void MtRequestTag::Record::increment() {
     ++_count;
 }
 
-void MtRequestTag::Record::decrement() {
+bool MtRequestTag::Record::decrement() {
     ORV_ASSERT_TEXT(_count > 0, "(*tag._id).first > 0");
-    if (--_count > 0) return;
+    if (--_count > 0) return false;
     ++_nbZeroes;
-    if (_requestZero != nullptr) _requestZero->pulse();
+    return _requestZero != nullptr;
 }
 
 bool MtRequestTag::Record::waitZero(const LkGuard<const LkMutex>& guard, const LkTimeLimit& limit) {

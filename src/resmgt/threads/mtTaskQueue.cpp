@@ -25,43 +25,45 @@ void MtTaskQueue::close() {
 }
 
 MtTaskQueue::Result MtTaskQueue::tryPut(MtTask& task) {
-    const LkGuard guard(_mutex);
-    return putNoLock(task);
+    return put(task, false);
 }
 
 MtTaskQueue::Result MtTaskQueue::put(MtTask& task) {
-    const LkGuard guard(_mutex);
-    for (;;) {
-        const Result result = putNoLock(task);
-        if (result != FULL) return result;
-        _notFull.wait(guard);
-    }
+    return put(task, true);
 }
 
-MtTaskQueue::Result MtTaskQueue::putNoLock(MtTask& task) {
-    if (_state != OPEN) return CLOSED;
-    if (_nbTasks == _ring.size()) return FULL;
-    _ring[(_first + _nbTasks) % _ring.size()] = std::move(task);
-    ++_nbTasks;
-    _notEmpty.signal();  // under the mutex: afterwards the queue may be gone
+// Signals are given without the mutex: a thread that is woken would only have to wait for it.
+
+MtTaskQueue::Result MtTaskQueue::put(MtTask& task, bool waitsForRoom) {
+    {
+        const LkGuard guard(_mutex);
+        while (waitsForRoom && _state == OPEN && _nbTasks == _ring.size()) _notFull.wait(guard);
+        if (_state != OPEN) return CLOSED;
+        if (_nbTasks == _ring.size()) return FULL;
+        _ring[(_first + _nbTasks) % _ring.size()] = std::move(task);
+        ++_nbTasks;
+    }
+    _notEmpty.signal();
     return DONE;
 }
 
 bool MtTaskQueue::take(MtTask& task, const std::function<bool()>& isOver) {
-    const LkGuard guard(_mutex);
-    for (;;) {
-        if (isOver && isOver()) {
-            // The signal that woke this thread may have been meant for a task.
-            if (_nbTasks > 0) _notEmpty.signal();
-            return false;
+    {
+        const LkGuard guard(_mutex);
+        for (;;) {
+            if (isOver && isOver()) {
+                // The signal that woke this thread may have been meant for a task.
+                if (_nbTasks > 0) _notEmpty.signal();
+                return false;
+            }
+            if (_nbTasks > 0) break;
+            if (_state == CLOSE) return false;
+            _notEmpty.wait(guard);
         }
-        if (_nbTasks > 0) break;
-        if (_state == CLOSE) return false;
-        _notEmpty.wait(guard);
+        task = std::move(_ring[_first]);
+        _first = (_first + 1) % _ring.size();
+        --_nbTasks;
     }
-    task = std::move(_ring[_first]);
-    _first = (_first + 1) % _ring.size();
-    --_nbTasks;
     _notFull.signal();
     return true;
 }

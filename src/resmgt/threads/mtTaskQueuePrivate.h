@@ -16,8 +16,7 @@ namespace Orv {
 /// It is shut at first: takers wait, and nothing can be put in. Once open it takes tasks until it is
 /// closed; what is inside then can still be taken out. prepare() makes it shut again.
 ///
-/// - Threads: every member by any thread. A thread that has taken a task may see to it that the queue
-///   is destroyed while the put() of that task has not returned yet.
+/// - Threads: every member by any thread.
 class MtTaskQueue {
 public:
     enum Result { DONE, FULL, CLOSED };
@@ -53,7 +52,7 @@ private:
     std::size_t _first ORV_GUARDED_BY(_mutex) = 0;
     std::size_t _nbTasks ORV_GUARDED_BY(_mutex) = 0;
 
-    Result putNoLock(MtTask& task) ORV_REQUIRES(_mutex);
+    Result put(MtTask& task, bool waitsForRoom);
 };
 
 }  // namespace Orv
