@@ -1,7 +1,9 @@
 #include "mtThreadFactoryWinNT.h"
 
-#include <tlhelp32.h>
+// clang-format off: in this order
 #include <windows.h>
+#include <tlhelp32.h>
+// clang-format on
 
 namespace Orv {
 
