@@ -47,16 +47,16 @@ public:
     ExMDStdAddStream(const char* file, int line);
 };
 
-/// A get or set that the property's attributes do not allow: `"set" is not available for property
-/// gain".`
+/// A get or set that the property's attributes do not allow: the reason quotes the
+/// operation, and ends with the property's name, which has a closing quote only.
 class ORV_RESMGT_API DevPrtclEx::ExMDPropertyIllegalOp
     : public ExConcrete<ExMDPropertyIllegalOp, DevPrtclEx> {
 public:
     ExMDPropertyIllegalOp(const char* file, int line, const char* operation, const char* property);
 };
 
-/// A set of a value that the property's description does not allow: `Value 7 is out of range for
-/// property gain: 0 to 1 by 0.1.`
+/// A set of a value that the property's description does not allow: "Value 7 is out of range for
+/// property gain: 0 to 1 by 0.1."
 class ORV_RESMGT_API DevPrtclEx::ExMDPropertyOutOfRange
     : public ExConcrete<ExMDPropertyOutOfRange, DevPrtclEx> {
 public:
