@@ -9,6 +9,13 @@
 #include "mtSpecificDataRegistry.h"
 #include "threadTesting.h"
 
+#if defined(ORV_TEST_SANITIZED)
+/// What a thread that is ended by force had is lost: its log queue, and what its body made.
+extern "C" const char* __lsan_default_suppressions() {
+    return "leak:Orv::LgRegistry::registerThread\nleak:MtThreadForcedStop_\n";
+}
+#endif
+
 namespace Orv {
 
 namespace {
@@ -46,7 +53,6 @@ TEST_F(MtThreadForcedStop, endsTheThreadWithoutUnwindingAndItMayBeStartedAgain) 
         int* number = nullptr;
         ~Value() { ++nbDeleted; }
     };
-    static std::vector<Value*> keptForLeakCheck;
     const MtSpecificData<Value> slot("slot");
     const std::size_t nbValuesBefore = registry.getNbValues();
     for (const bool doesWait : {true, false}) {
@@ -57,7 +63,7 @@ TEST_F(MtThreadForcedStop, endsTheThreadWithoutUnwindingAndItMayBeStartedAgain) 
         const ObjPtr<MtThread> thread = makeThread("victim", [&](MtThread&) {
             const CountsDestructions onStack{nbDestroyed};
             EXPECT_EQ(slot.find(), nullptr) << "the value of an earlier thread";
-            keptForLeakCheck.push_back(&slot.get());
+            slot.get();
             if (nbRuns++ == 3) return;
             EXPECT_FALSE(never.timedWait(0.001));
             // From here on it takes nothing along: no lock of the C library, none of the test.
