@@ -41,7 +41,7 @@ TEST(PoolAndAlarms, leaveAnIdleProcessIdle) {
     for (int i = 0; i < 20; ++i) pool.submit(tag, [] {});
     pool.wait(tag);
 
-    // A worker that waits as a helper, a submitter without room, and two more that wait for the tag.
+    // A worker inside a task, one that waits for a tag, and two threads that wait for tags.
     const MtRequestTag open = requests.acquireTag();
     requests.incRequestCount(open);
     TestCounter nbThere;
