@@ -9,7 +9,7 @@
 #include "cpuTime.h"
 #include "gate.h"
 #include "mtAlarmHandle.h"
-#include "mtAlarmManager.h"
+#include "mtAlarmManagerImpPrivate.h"
 #include "mtTaskPool.h"
 #include "mtThread.h"
 #include "mtThreadFactory.h"
@@ -37,13 +37,21 @@ public:
     }
 
     /// Threads wait for the tag, for a task of it, with a time-out, and for a thread's end, while
-    /// an alarm is due in half an hour and a pool has one worker without work.
+    /// an alarm is due in half an hour, another manager has none, and of a pool's workers one is
+    /// inside a task, one waits for that as a task may, and one has no work.
     void park() {
         _release = std::make_unique<Gate>();
         _tag = _requests.acquireTag();
         _requests.incRequestCount(_tag);
         _taskTag = _pool.getRequestMgr().acquireTag();
-        _pool.submit(_taskTag, [gate = _release.get()] { gate->wait(); });
+        _helperTag = _pool.getRequestMgr().acquireTag();
+        Gate isTaken;
+        _pool.submit(_taskTag, [&isTaken, gate = _release.get()] {
+            isTaken.open();
+            gate->wait();
+        });
+        isTaken.wait();
+        _pool.submit(_helperTag, [this] { _pool.wait(_taskTag); });
         _thread = MtThreadFactory::getInstance().create(
             "waits", MtThreadFunction::create([gate = _release.get()] { gate->wait(); }));
         _thread->start();
@@ -60,12 +68,18 @@ public:
         MtAlarmManager::getInstance().deregisterAlarm(_alarm);
         setAlarm(0);
         EXPECT_TRUE(_callback.nbCalls.waitFor(++_nbRounds));
+        const RCShdPtr<MtAlarmHandle> once = MtAlarmHandle::create();
+        once->setCallback(&_callback);
+        EXPECT_TRUE(_emptyManager.registerAlarm(once));
+        EXPECT_TRUE(_callback.nbCalls.waitFor(++_nbRounds));
         _release->open();
         _requests.decRequestCount(_tag);
         for (std::thread& waiter : _waiters) waiter.join();
         _waiters.clear();
+        _pool.wait(_helperTag);
         _requests.releaseTag(_tag);
         _pool.getRequestMgr().releaseTag(_taskTag);
+        _pool.getRequestMgr().releaseTag(_helperTag);
     }
 
 private:
@@ -75,7 +89,9 @@ private:
     MtRequestMgr _requests;
     MtRequestTag _tag;
     MtRequestTag _taskTag;
-    MtTaskPool _pool{"idle", 2};
+    MtRequestTag _helperTag;
+    MtAlarmManagerImp _emptyManager;
+    MtTaskPool _pool{"idle", 3};
     ObjPtr<MtThread> _thread;
     std::vector<std::thread> _waiters;
     int _nbRounds = 0;

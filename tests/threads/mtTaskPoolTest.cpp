@@ -1,4 +1,5 @@
 #include <atomic>
+#include <chrono>
 #include <functional>
 #include <gtest/gtest.h>
 #include <memory>
@@ -222,6 +223,31 @@ TEST(MtTaskPool, aWorkerThatWaitsIsWokenForTasksThatComeLater) {
         });
         pool.wait(outer);
         ASSERT_TRUE(hasRun);
+    }
+}
+
+TEST(MtTaskPool, aWorkerThatWaitsIsWokenWhenAnotherOneDoesTheLastTask) {
+    MtTaskPool pool("pool", 2);
+    pool.start();
+    MtRequestMgr& requests = pool.getRequestMgr();
+    const MtRequestTag outer = requests.acquireTag();
+    const MtRequestTag inner = requests.acquireTag();
+    for (int round = 0; round < 20; ++round) {
+        Gate isTaken, mayEnd;
+        TestCounter nbWaiting;
+        pool.submit(inner, [&] {
+            isTaken.open();
+            mayEnd.wait();
+        });
+        ASSERT_TRUE(isTaken.wait());
+        pool.submit(outer, [&] {
+            nbWaiting.add();
+            pool.wait(inner);
+        });
+        ASSERT_TRUE(nbWaiting.waitFor(1));
+        if (round % 2 == 0) std::this_thread::sleep_for(std::chrono::milliseconds(1));
+        mayEnd.open();
+        ASSERT_TRUE(requests.timedWaitRequestCountZero(outer, getWaitLimitSeconds()));
     }
 }
 

@@ -121,6 +121,37 @@ TEST(MtTaskQueue, eachTaskReachesOneTakerWhoeverElseWaits) {
     EXPECT_EQ(nbRun, 2 * NB_TASKS);
 }
 
+TEST(MtTaskQueue, whoLeavesWithoutATaskPassesItsWakeUpOn) {
+    MtTaskQueue queue(1);
+    queue.open();
+    std::atomic<bool> isOver{false};
+    TestCounter nbWaiting, nbTaken;
+    // isOver() is asked with the queue locked, so the first one waits before the second asks, and
+    // both wait before the task comes.
+    std::jthread leaves([&] {
+        MtTask task;
+        EXPECT_FALSE(queue.take(task, [&] {
+            nbWaiting.add();
+            return isOver.load();
+        }));
+    });
+    ASSERT_TRUE(nbWaiting.waitFor(1));
+    std::jthread takes([&] {
+        MtTask task;
+        EXPECT_TRUE(queue.take(task, [&] {
+            nbWaiting.add();
+            return false;
+        }));
+        nbTaken.add();
+    });
+    ASSERT_TRUE(nbWaiting.waitFor(2));
+    isOver = true;
+    MtTask task = MtTask::create(MtRequestTag(), [] {});
+    EXPECT_EQ(queue.put(task), MtTaskQueue::DONE);
+    EXPECT_TRUE(nbTaken.waitFor(1));
+    queue.close();
+}
+
 }  // namespace
 
 }  // namespace Orv

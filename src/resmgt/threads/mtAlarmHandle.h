@@ -54,8 +54,8 @@ private:
         bool isLast;
     };
 
-    // Registering and deregistering touch the first cache line and the lock behind it, whatever
-    // else the handle holds: with many handles that is what they cost.
+    // What registering and deregistering touch stands side by side, up to the lock: with many
+    // handles they cost as much as the memory that they fetch.
     std::uint32_t _place;  // in the manager's queue; guarded by its mutex
     std::uint32_t _requestedRepeats ORV_GUARDED_BY(_lock) = 0;
     double _timeRegistered ORV_GUARDED_BY(_lock) = 0;

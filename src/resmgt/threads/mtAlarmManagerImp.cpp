@@ -48,9 +48,13 @@ MtAlarmManagerImp::MtAlarmManagerImp() : _priority("MtAlarmManager", MtPriorityM
 }
 
 MtAlarmManagerImp::~MtAlarmManagerImp() {
-    {
-        const ObjPtr<MtThread> ending(_thread);
-    }  // asks it to stop and joins it
+    // Callbacks may still use the manager while the thread is on its way out.
+    stop();
+    try {
+        _thread->join();
+    } catch (...) {
+        Assertions::traceCurrentException("ending the alarm thread");
+    }
     const LkGuard guard(_mutex);
     while (!_queue.isEmpty()) leaveNoLock(*_queue.getHandle(_queue.takeFirst()));
 }
