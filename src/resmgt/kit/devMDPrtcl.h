@@ -1,6 +1,6 @@
 #pragma once
 
-#include "rcBase.h"
+#include "rcBaseWithDestroy.h"
 #include "rcShdPtr.h"
 #include "resmgtApi.h"
 
@@ -9,7 +9,7 @@ namespace Orv {
 /// Root of all device protocols: what a manager holds of a device. What the device can do shows in
 /// the protocols that it also derives from: DevMDAccessPrtcl, DevMDPropertyPrtcl,
 /// DevMDStreamPrtcl.
-class ORV_RESMGT_API DevMDPrtcl : public RCBase<LkCounter<long>> {
+class ORV_RESMGT_API DevMDPrtcl : public RCBaseWithDestroy<LkCounter<long>> {
 public:
     ~DevMDPrtcl() noexcept(false) override;
 };

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "liString.h"
-#include "lkUnnamedSema.h"
+#include "lkSema.h"
 #include "rcShdPtr.h"
 #include "resmgtApi.h"
 
@@ -17,8 +17,8 @@ private:
     const LiString _name;
 
 public:
-    LkUnnamedSema arrival;  ///< The receiver is there.
-    LkUnnamedSema release;  ///< The receiver may go on.
+    LkSema arrival;  ///< The receiver is there.
+    LkSema release;  ///< The receiver may go on.
 };
 
 /// One side of a rendezvous of two threads: it announces itself with post() and is held in wait()

@@ -12,6 +12,7 @@ public:
     explicit DevSenderWait(DevReceiverWait& receiver) : _point(receiver._point) {}
 
     void wait() { _point->arrival.wait(); }  ///< Blocks until the receiver has come.
+    [[nodiscard]] bool timedWait(double seconds) { return _point->arrival.timedWait(seconds); }
     void post() { _point->release.post(); }  ///< Lets it go.
 
 private:
