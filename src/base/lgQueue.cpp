@@ -91,12 +91,11 @@ std::int64_t LgQueue::observe(std::int64_t now) noexcept {
     _nbObservedLost =
         _nbLost.load(std::memory_order_acquire);  // before the look at what was pushed
     const std::uint64_t progress = _progress.load(std::memory_order_seq_cst);
-    if (progress % 2 == 0) {
-        _quietUntil = now;
-    } else if (progress != _observedProgress) {
+    const bool isPushing = progress % 2 != 0;
+    if (isPushing && progress != _observedProgress) {
         _quietUntil = std::max(_quietUntil, _observedAt);  // this record was begun after that
         _pushSeenAt = now;
-    } else if (now - _pushSeenAt > LONGEST_PUSH) {
+    } else if (!isPushing || now - _pushSeenAt > LONGEST_PUSH) {
         _quietUntil = now;
     }
     _observedProgress = progress;

@@ -18,9 +18,8 @@ class ObjPtrRet;
 /// on by copying uses std::unique_ptr instead; for shared ownership there is RCShdPtr.
 ///
 /// - Threads: one pointer object is used by one thread at a time.
-/// - Errors: what the object's destructor throws reaches the caller of reset() and assignment,
-/// after
-///   the pointer has its new value; the pointer's own destructor traces it.
+/// - Errors: what the object's destructor throws reaches the caller of reset() and assignment
+///   after the pointer has its new value; the pointer's own destructor traces it.
 template <class T>
 class ObjPtr {
 public:

@@ -19,8 +19,7 @@ namespace Orv {
 ///
 /// - Threads: copies may be used by different threads at once, one object by one thread at a time.
 /// - Errors: LiStringEx::ExOutOfBounds for a position, LiStringEx::ExTooLong (std::length_error)
-/// for
-///   more than 2147483647 characters, std::bad_alloc; each leaves the string as it was.
+///   for more than 2147483647 characters, std::bad_alloc; each leaves the string as it was.
 /// - Arguments may be the string itself or lie in it.
 class ORV_RESMGT_API LiString {
 public:

@@ -14,8 +14,7 @@ public:
     /// The next token. A quoted one may be empty and contain anything but a double quote; its
     /// quotes are consumed and left out.
     /// @return empty at the end of input, with the stream's fail flag set; also for a missing
-    /// closing
-    ///   quote.
+    ///   closing quote.
     LiString readToken(std::istream& stream) const;
 };
 

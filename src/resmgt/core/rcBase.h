@@ -17,8 +17,7 @@ class RCBasePtr;
 /// RCBaseWithDestroy recycles instead of deleting; RCProxy counts a type that has no such base.
 ///
 /// - Threads: with @p C = LkCounter<long>, any thread may take and release, and whoever destroys
-/// the
-///   object sees what all other holders wrote to it. With @p C = int, one thread at a time.
+///   the object sees what all other holders wrote to it. With @p C = int, one thread at a time.
 /// - A destructor may put its own object into counted pointers; it is still destroyed once.
 template <class C>
 class ORV_HEADER_API RCBase {
@@ -29,10 +28,8 @@ public:
 
 protected:
     RCBase() noexcept = default;
-    RCBase(const RCBase&) noexcept {}  ///< The copy has no holder yet.
-    RCBase& operator=(const RCBase&) noexcept {
-        return *this;
-    }  ///< Holders stay with their object.
+    RCBase(const RCBase&) noexcept {}                            ///< The copy has no holder yet.
+    RCBase& operator=(const RCBase&) noexcept { return *this; }  ///< Holders stay.
 
     // For the pointers, and for a class that counts its own way, which hides them.
 

@@ -20,9 +20,8 @@ class LkMutexAttr;
 /// - Threads: any thread may take it, the one that took it releases it. It may be destroyed as soon
 ///   as the last who wanted it has it and has released it.
 /// - Errors: releasing it without holding it is an assertion, and leaves the holder alone.
-/// Destroying
-///   a held one is an assertion. If its holder has ended, the next to lock it gets an assertion, on
-///   Linux within about a second; after that the mutex is free.
+///   Destroying a held one is an assertion. If its holder has ended, the next to lock it gets an
+///   assertion, on Linux within about a second; after that the mutex is free.
 class ORV_RESMGT_API ORV_CAPABILITY("mutex") LkMutex {
 public:
     class Native;  // LkMutexPosix or LkMutexWindows

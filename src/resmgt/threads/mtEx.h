@@ -37,7 +37,7 @@ public:
     ExThrownException(const char* file, int line, const std::string& thread, const ExBase& thrown);
     ExThrownException(const ExThrownException&);  ///< Clones what was thrown.
 
-    const ExBase& getThrown() const noexcept { return *_thrown.get(); }
+    const ExBase& getThrown() const noexcept { return *_thrown; }
 
 private:
     ObjPtr<ExBase> _thrown;  // never null

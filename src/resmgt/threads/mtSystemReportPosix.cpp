@@ -24,7 +24,7 @@ void readProcessor(MtSystemReport& report) {
     const unsigned extendedFamily = (signature >> 20) & 0xFF;
     const unsigned model = ((signature >> 4) & 0xF) | ((signature >> 12) & 0xF0);
     report.processorLevel = static_cast<long>(baseFamily + (baseFamily == 15 ? extendedFamily : 0));
-    report.processorRevision = static_cast<long>(model << 8 | (signature & 0xF));
+    report.processorRevision = static_cast<long>(model) << 8 | static_cast<long>(signature & 0xF);
 }
 
 long long readActiveMask() {

@@ -22,8 +22,7 @@ public:
     /// temporary file of its own. Never faults.
     /// @param length  bytes; nothing to read is readable.
     /// @return 1 if all of it can be read, 0 if not or if there is no such file, -1 on other
-    /// errors,
-    ///   which are printed.
+    ///   errors, which are printed.
     static int testWritable(const void* address, int length);
 
     /// Reports machine and system on standard output, one value per line.

@@ -3,12 +3,13 @@
 #include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
-#include <sched.h>
 #include <string>
 #include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include "envVar.h"
+#include "mtProcessorsPosix.h"
 #include "mtUtil.h"
 #include "osError.h"
 #include "trace.h"
@@ -23,8 +24,7 @@ void printError(const char* step) {
 
 /// A file without a name in the temporary folder; below 0 if there is none to be had.
 int openProbeFile() {
-    const char* const folder = std::getenv("TMPDIR");
-    std::string path = std::string(folder != nullptr ? folder : "/tmp") + "/orvProbeXXXXXX";
+    std::string path = EnvVar("TMPDIR").getText().value_or("/tmp") + "/orvProbeXXXXXX";
     const int file = ::mkostemp(path.data(), O_CLOEXEC);
     if (file >= 0) ::unlink(path.c_str());
     return file;
@@ -44,11 +44,7 @@ int probe(int file, const char* byte) {
 }  // namespace
 
 int MtUtil::getNbProcessors() {
-    cpu_set_t set;
-    // Of the process, which is its first thread: the calling one may be placed.
-    if (::sched_getaffinity(::getpid(), sizeof set, &set) == 0) return CPU_COUNT(&set);
-    const long nbOnline = ::sysconf(_SC_NPROCESSORS_ONLN);
-    return nbOnline > 0 ? static_cast<int>(nbOnline) : 1;
+    return MtProcessorsPosix::getNumber();
 }
 
 int MtUtil::testWritable(const void* address, int length) {
