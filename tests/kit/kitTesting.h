@@ -5,6 +5,7 @@
 #include <stdexcept>
 
 #include "devMDStdDevice.h"
+#include "devMDStdStreamActiveSink.h"
 #include "gate.h"
 
 namespace Orv {
