@@ -4,7 +4,7 @@
 
 namespace Orv {
 
-constinit ThreadSlot::AtEnd ThreadSlot::_atEnd[NB_OWNERS] = {};
+constinit std::atomic<ThreadSlot::AtEnd> ThreadSlot::_atEnds[NB_OWNERS] = {};
 
 namespace {
 
@@ -12,10 +12,6 @@ namespace {
 constexpr int MOST_ROUNDS = 100;
 
 }  // namespace
-
-ThreadSlot::ThreadSlot(Owner owner, AtEnd atEnd) noexcept : _owner(owner) {
-    _atEnd[owner] = atEnd;
-}
 
 void* ThreadSlot::get() const noexcept {
     const Values* const values = find();
@@ -29,6 +25,7 @@ bool ThreadSlot::set(void* value) {
         values = &watch();
     }
     if (values->hasEnded) return false;
+    _atEnds[_owner].store(_atEnd, std::memory_order_relaxed);
     values->pointers[_owner] = value;
     return true;
 }
@@ -44,8 +41,9 @@ void ThreadSlot::tellAll(Values& values) noexcept {
         isEmpty = true;
         for (int i = 0; i < NB_OWNERS; ++i) {
             void* const value = std::exchange(values.pointers[i], nullptr);
-            if (value == nullptr || _atEnd[i] == nullptr) continue;
-            _atEnd[i](value);
+            const AtEnd atEnd = _atEnds[i].load(std::memory_order_relaxed);
+            if (value == nullptr || atEnd == nullptr) continue;
+            atEnd(value);
             isEmpty = false;
         }
     }

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <atomic>
+
 #include "baseApi.h"
 
 namespace Orv {
@@ -11,7 +13,7 @@ namespace Orv {
 /// thread's last destructors run, and comes back empty when one of these touches it.
 ///
 /// - Threads: each sees its own pointer.
-/// - Ownership: a slot lives as long as the process.
+/// - Ownership: a slot lives as long as the process; make it constinit, or never destroy it.
 class ORV_BASE_API ThreadSlot {
 public:
     /// Whose slot it is, one for each. At a thread's end they are told in this order, and again if
@@ -21,7 +23,8 @@ public:
     /// Called on the thread that ends, if its pointer is not null; the slot is empty by then.
     using AtEnd = void (*)(void* value) noexcept;
 
-    explicit ThreadSlot(Owner owner, AtEnd atEnd = nullptr) noexcept;
+    explicit constexpr ThreadSlot(Owner owner, AtEnd atEnd = nullptr) noexcept
+        : _owner(owner), _atEnd(atEnd) {}
 
     ThreadSlot(const ThreadSlot&) = delete;
     ThreadSlot& operator=(const ThreadSlot&) = delete;
@@ -40,9 +43,10 @@ private:
     struct Values;
     struct Platform;
 
-    static AtEnd _atEnd[NB_OWNERS];
-
     const Owner _owner;
+    const AtEnd _atEnd;
+
+    static std::atomic<AtEnd> _atEnds[NB_OWNERS];
 
     static void tellAll(Values& values) noexcept;
 

@@ -10,9 +10,9 @@ namespace Orv {
 
 struct ThreadSlot::Platform {
     static constinit thread_local Values values;
-    static constinit thread_local bool isWatched;
+    static constinit thread_local Values* watched;  // null until the thread is
 
-    static void notice(void*) { tellAll(values); }
+    static void notice(void* values) { tellAll(*static_cast<Values*>(values)); }
 
     static pthread_key_t makeKey() {
         pthread_key_t key;
@@ -23,18 +23,17 @@ struct ThreadSlot::Platform {
 };
 
 constinit thread_local ThreadSlot::Values ThreadSlot::Platform::values{};
-constinit thread_local bool ThreadSlot::Platform::isWatched = false;
+constinit thread_local ThreadSlot::Values* ThreadSlot::Platform::watched = nullptr;
 
 ThreadSlot::Values* ThreadSlot::find() noexcept {
-    return Platform::isWatched ? &Platform::values : nullptr;
+    return Platform::watched;
 }
 
 ThreadSlot::Values& ThreadSlot::watch() {
     static const pthread_key_t key = Platform::makeKey();
     const int error = ::pthread_setspecific(key, &Platform::values);
     ORV_ASSERT_SYS(error == 0, "::pthread_setspecific( key, &values ) == 0", error);
-    Platform::isWatched = true;
-    return Platform::values;
+    return *(Platform::watched = &Platform::values);
 }
 
 }  // namespace Orv

@@ -25,18 +25,14 @@ MtSpecificDataRegistry& MtSpecificDataRegistry::getInstance() {
     return *registry;
 }
 
-ThreadSlot& MtSpecificDataRegistry::getSlot() {
-    static auto& slot = *new ThreadSlot(ThreadSlot::THREAD_DATA, noticeEnd);
-    return slot;
-}
-
 std::uintptr_t MtSpecificDataRegistry::getThreadNumber() {
     static constinit std::atomic<std::uintptr_t> lastNumber{0};
-    ThreadSlot& slot = getSlot();
-    if (void* const number = slot.get()) return reinterpret_cast<std::uintptr_t>(number);
+    if (void* const number = _ownNumber.get()) return reinterpret_cast<std::uintptr_t>(number);
     const std::uintptr_t number = lastNumber.fetch_add(1, std::memory_order_relaxed) + 1;
-    return slot.set(reinterpret_cast<void*>(number)) ? number : 0;
+    return _ownNumber.set(reinterpret_cast<void*>(number)) ? number : 0;
 }
+
+constinit ThreadSlot MtSpecificDataRegistry::_ownNumber(ThreadSlot::THREAD_DATA, noticeEnd);
 
 void MtSpecificDataRegistry::noticeEnd(void* number) noexcept {
     try {
@@ -54,7 +50,7 @@ void MtSpecificDataRegistry::addSpecificData(const MtOpaqueData* data) {
 }
 
 void MtSpecificDataRegistry::removeSpecificData() {
-    if (const void* const number = getSlot().get()) {
+    if (const void* const number = _ownNumber.get()) {
         removeThread(reinterpret_cast<std::uintptr_t>(number));
     }
 }
@@ -127,6 +123,11 @@ void MtSpecificDataRegistry::removeSlot(const MtOpaqueData* data) noexcept {
             Assertions::traceCurrentException("deleting the data of a slot that goes");
         }
     }
+}
+
+void MtSpecificDataRegistry::whileLocked(const std::function<void()>& action) const {
+    const LkGuard guard(_lock);
+    action();
 }
 
 std::size_t MtSpecificDataRegistry::getNbValues() const {

@@ -2,16 +2,17 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <map>
 
 #include "lkRecLock.h"
 #include "resmgtApi.h"
 #include "threadSafety.h"
+#include "threadSlot.h"
 
 namespace Orv {
 
 class MtOpaqueData;
-class ThreadSlot;
 
 /// Which slots hold a value for which thread, so that each value is deleted once: when its thread
 /// ends or when its slot goes. One for the process, never destroyed.
@@ -38,6 +39,9 @@ public:
     /// been at work on any of them.
     void forgetThread(std::uintptr_t number) noexcept;
 
+    /// For an action during which no other thread may stand in the registry.
+    void whileLocked(const std::function<void()>& action) const;
+
     /// The calling thread's number, by which values are kept: unlike the system's it never comes
     /// back. 0 once the thread's end has been dealt with; what is made then stays until its slot
     /// goes.
@@ -52,6 +56,8 @@ private:
     };
     using Entries = std::multimap<std::uintptr_t, Entry>;
 
+    static ThreadSlot _ownNumber;  // each thread's
+
     mutable LkRecLock _lock{"MtSpecificDataRegistry"};
     Entries _entries ORV_GUARDED_BY(_lock);
 
@@ -60,7 +66,6 @@ private:
     void removeThread(std::uintptr_t number);
     bool removeFirst(std::uintptr_t number);
     static void noticeEnd(void* number) noexcept;
-    static ThreadSlot& getSlot();
 };
 
 }  // namespace Orv

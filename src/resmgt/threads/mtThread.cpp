@@ -30,7 +30,7 @@ struct MtThread::Frame {
     std::exception_ptr thrown{};          // the first of all
     ObjPtr<MtThreadProtocol> orphaned{};  // of an object that has gone
 
-    ~Frame() { getSlot().set(nullptr); }
+    ~Frame() { current.set(nullptr); }
 
     /// Does a step of the end. Only the C library's own unwinding keeps it from the next one.
     template <class Step>
@@ -44,11 +44,9 @@ struct MtThread::Frame {
         }
     }
 
-    static ThreadSlot& getSlot() {
-        static auto& slot = *new ThreadSlot(ThreadSlot::THREADS);
-        return slot;
-    }
-    static Frame* find() noexcept { return static_cast<Frame*>(getSlot().get()); }
+    static Frame* find() noexcept { return static_cast<Frame*>(current.get()); }
+
+    static constinit inline ThreadSlot current{ThreadSlot::THREADS};
 };
 
 namespace {
@@ -98,6 +96,7 @@ MtThread::MtThread(const LiString& name, ObjPtr<MtThreadProtocol> protocol, MtTh
 MtThread::~MtThread() noexcept(false) {
     const bool isOnItself = isCurrentThread() && !_isMainThread;
     if (isOnItself) {
+        const LkGuard starterHasLeft(_lock);
         _native->detach();
     } else if (!_isMainThread) {
         stopAndJoin();
@@ -115,7 +114,7 @@ void MtThread::adoptCurrentThread() {
     static Frame* const frame = new Frame{nullptr};
     _native->adoptCurrent();
     frame->thread = this;
-    Frame::getSlot().set(frame);
+    Frame::current.set(frame);
     LgRegistry::getInstance().registerThread(_name.getText());
     _isRunning.store(true, std::memory_order_release);
 }
@@ -164,9 +163,10 @@ void MtThread::start() {
         _native->release();
         std::rethrow_exception(std::exchange(_startError, nullptr));
     }
-    const bool isRefused = _isLevelRefused;
-    guard.unlock();
-    if (isRefused) traceRefusal(_name);
+    if (!_isLevelRefused) return;
+    const LiString name = _name;
+    guard.unlock();  // the body may destroy the object from here on
+    traceRefusal(name);
 }
 
 void MtThread::join() {
@@ -290,7 +290,7 @@ bool MtThread::enter(Frame& frame) noexcept {
     try {
         _native->enter();
         _isCancelRequested.store(false, std::memory_order_relaxed);
-        Frame::getSlot().set(&frame);
+        Frame::current.set(&frame);
         _dataNumber = MtSpecificDataRegistry::getThreadNumber();
         LgRegistry::getInstance().registerThread(_name.getText());
         _native->setName(_name.getChars());
@@ -333,7 +333,6 @@ void MtThread::finish(Frame& frame) {
         }
     });
     frame.attempt(freeSpecificData);
-    LgRegistry::getInstance().unregisterThread();
     if (frame.thread != nullptr) {
         frame.thread->end(frame.thrown);
     } else if (frame.thrown) {
@@ -398,8 +397,7 @@ bool MtThread::isCancelable() const {
 
 bool MtThread::forceStop() {
     bool isStopped = false;
-    {
-        // With the lock held, so that the thread cannot take it along.
+    MtThreadMgr::get().imp().getThreads().whileLocked([&] {
         const LkGuard guard(_lock);
         if (!_isCancelable) {
             Assertions::throwProgramAborted(ORV_FILE, __LINE__, "_cancelable is FALSE!!!");
@@ -407,10 +405,19 @@ bool MtThread::forceStop() {
         ORV_ASSERT(isRunningNoLock());
         ORV_ASSERT(!_isMainThread);
         ORV_ASSERT(!isCurrentThread());
-        _isForced = true;
-        isStopped = _native->terminate();
-    }
+        isStopped = _hasEnded || terminateNoLock();
+    });
     if (_protocol) _protocol->performCanceled(this);
+    return isStopped;
+}
+
+/// With all locks held that every thread of the process needs now and then: none is taken along.
+bool MtThread::terminateNoLock() {
+    bool isStopped = false;
+    MtSpecificDataRegistry::getInstance().whileLocked([&] {
+        isStopped = _native->terminate();
+        _isForced = true;
+    });
     return isStopped;
 }
 
