@@ -10,6 +10,7 @@
 #include "currentException.h"
 #include "envIntVar.h"
 #include "lgRegistry.h"
+#include "lkAdaptiveWait.h"
 #include "mtEx.h"
 #include "mtNative.h"
 #include "mtPriorityMgr.h"
@@ -481,7 +482,9 @@ bool MtThread::applyClass(bool isRealTime) {
 void MtThread::setProcessorNb(int number) {
     const LkGuard guard(_lock);
     _processorNb = number;
-    if (isProcessorPlaceable(number) && isAliveNoLock()) _native->setProcessor(number);
+    if (!isProcessorPlaceable(number) || !isAliveNoLock()) return;
+    _native->setProcessor(number);
+    LkAdaptiveWait::forgetPlacement();
 }
 
 int MtThread::getProcessorNb() const {
