@@ -166,14 +166,14 @@ public:
     std::atomic<long> nbSeen{0};
 };
 
-void push(benchmark::State& state) {
+void push(benchmark::State& state, std::size_t nbBytes) {
     const RCShdPtr<Sink> sink(new Sink);
     sink->performOpen();
     DevMDStdStreamActiveSource source("source", "");
     source.connect(sink->input);
     sink->input->start();
     source.start();
-    const RCShdPtr<DevMDStreamBuf> frame(new Frame(static_cast<std::size_t>(state.range(0))));
+    const RCShdPtr<DevMDStreamBuf> frame(new Frame(nbBytes));
     for (auto _ : state) {
         source.push(ObjPtr<DevMDStreamElem>(new DevMDStreamElem(frame, DevMDStreamElem::DATA)));
     }
@@ -204,14 +204,14 @@ private:
 };
 
 /// Bytes of the heap that a thousand open devices take, each.
-void memory(benchmark::State& state) {
+void memory(benchmark::State& state, int nbProperties) {
     constexpr std::size_t nbDevices = 1000;
     for (auto _ : state) {
         std::vector<RCShdPtr<Furnished>> devices;
         devices.reserve(nbDevices);
         const std::size_t before = ::mallinfo2().uordblks;
         for (std::size_t i = 0; i < nbDevices; ++i) {
-            devices.emplace_back(new Furnished(static_cast<int>(state.range(0))));
+            devices.emplace_back(new Furnished(nbProperties));
             devices.back()->performOpen();
         }
         const std::size_t bytes = ::mallinfo2().uordblks - before;
@@ -226,10 +226,18 @@ const bool isRegistered = [] {
     registerQueue<MoodycamelQueue>("moodycamel (unbounded)");
     registerQueue<GLibQueue>("GAsyncQueue (unbounded)");
     registerQueue<PocoQueue>("Poco (unbounded)");
-    benchmark::RegisterBenchmark("push 1 KB/ORV", push)->Arg(1 << 10)->UseRealTime();
-    benchmark::RegisterBenchmark("push 8 MB/ORV", push)->Arg(8 << 20)->UseRealTime();
-    benchmark::RegisterBenchmark("open device of/100 properties", memory)->Arg(100)->Iterations(1);
-    benchmark::RegisterBenchmark("open device of/no properties", memory)->Arg(0)->Iterations(1);
+    benchmark::RegisterBenchmark("push an element/1 KB", [](benchmark::State& state) {
+        push(state, 1 << 10);
+    })->UseRealTime();
+    benchmark::RegisterBenchmark("push an element/8 MB", [](benchmark::State& state) {
+        push(state, 8 << 20);
+    })->UseRealTime();
+    for (const int nb : {0, 100}) {
+        benchmark::RegisterBenchmark(
+            ("1000 devices of/" + std::to_string(nb) + " properties").c_str(),
+            [nb](benchmark::State& state) { memory(state, nb); })
+            ->Iterations(1);
+    }
     return true;
 }();
 

@@ -6,11 +6,13 @@
 #include <atomic>
 #include <benchmark/benchmark.h>
 #include <condition_variable>
+#include <cstdlib>
 #include <deque>
 #include <functional>
 #include <future>
 #include <linux/futex.h>
 #include <mutex>
+#include <new>
 #include <orv/devMDStdDevice.h>
 #include <orv/devMgr.h>
 #include <orv/devMgrPropertyObserverUtil.h>
@@ -28,6 +30,8 @@ namespace {
 
 using Clock = std::chrono::steady_clock;
 using namespace Orv;
+
+std::atomic<long> nbAllocations{0};
 
 // --- those who are asked ---
 
@@ -171,6 +175,8 @@ template <class Asked>
 void get(benchmark::State& state, std::chrono::microseconds pause) {
     Latency latency;
     Asked asked;
+    asked.ask();
+    const long nbBefore = nbAllocations.load();
     for (auto _ : state) {
         if (pause.count() > 0) std::this_thread::sleep_for(pause);
         const auto start = Clock::now();
@@ -179,6 +185,8 @@ void get(benchmark::State& state, std::chrono::microseconds pause) {
         state.SetIterationTime(std::chrono::duration<double>(duration).count());
         latency.add(duration);
     }
+    state.counters["allocations"] = benchmark::Counter(
+        static_cast<double>(nbAllocations.load() - nbBefore), benchmark::Counter::kAvgIterations);
     latency.report(state);
 }
 
@@ -254,8 +262,7 @@ void notification(benchmark::State& state) {
     while (nbHeard.load() < nbSent) std::this_thread::yield();
 }
 
-void resolve(benchmark::State& state) {
-    const auto nbProperties = static_cast<int>(state.range(0));
+void resolve(benchmark::State& state, int nbProperties) {
     Managed managed(nbProperties);
     const int last = nbProperties - 1;
     const std::string text = "bench:set" + std::to_string(last % 10) + ":p" + std::to_string(last);
@@ -274,10 +281,22 @@ const bool isRegistered = [] {
     benchmark::RegisterBenchmark("notification/ORV", notification)->UseRealTime();
     for (const int nb : {10, 1000, 10000}) {
         benchmark::RegisterBenchmark(("resolve/" + std::to_string(nb) + " properties").c_str(),
-                                     resolve)
-            ->Arg(nb);
+                                     [nb](benchmark::State& state) { resolve(state, nb); });
     }
     return true;
 }();
 
 }  // namespace
+
+/// Counts what everybody in the process, the libraries included, takes from the heap with new.
+void* operator new(std::size_t nbBytes) {
+    nbAllocations.fetch_add(1, std::memory_order_relaxed);
+    if (void* const memory = std::malloc(nbBytes)) return memory;
+    throw std::bad_alloc();
+}
+void operator delete(void* memory) noexcept {
+    std::free(memory);
+}
+void operator delete(void* memory, std::size_t) noexcept {
+    std::free(memory);
+}

@@ -320,6 +320,9 @@ TEST(DevMDStdProperty, anEventObjectThatIsReplacedWhileItRunsLivesUntilItReturns
     open.value->setObserverAEO(
         ObjPtr<DevMDPropertyAEO>(new CountingAEO(nbThrown, nbThrownGone, [] { throw Death(); })));
     open.value->notify(1);  // traced
+    EXPECT_EQ(nbThrown.get(), 0);
+    open.value->setObserverAEO(nullptr);
+    EXPECT_EQ(nbThrownGone.get(), 1);
 }
 
 TEST(DevMDStdProperty, observersMayBeSetWhileTheDeviceNotifies) {

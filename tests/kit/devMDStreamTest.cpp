@@ -38,10 +38,10 @@ int codeOf(const Elem& elem) {
 
 /// A device with a sink that notes what it is given.
 struct SinkDevice {
-    RCShdPtr<TestDevice> device;
-    RCShdPtr<DevMDStdStreamPassiveSink> sink;
     std::vector<int> seen;  // of the device's thread, and of the test when that is closed
     TestCounter nbSeen;
+    RCShdPtr<DevMDStdStreamPassiveSink> sink;
+    RCShdPtr<TestDevice> device;  // closed before the rest goes
 
     explicit SinkDevice(int capacity = 25) : device(new TestDevice("sink", capacity)) {
         sink = device->addSink("input", "", [this](const ObjPtr<Elem>& elem) {
