@@ -1,5 +1,5 @@
 # Fails unless every block of C++ in a document stands, line for line, in one of the sources that
-# examples compile. cmake -DDOCUMENT=x.md "-DSOURCES=a.cpp;b.h" -P checkSnippets.cmake
+# examples compile. cmake -DDOCUMENT=x.md -DSOURCES=a.cpp,b.h -P checkSnippets.cmake
 
 # Indentation and blank lines do not count; ";" and brackets would make lists of the texts.
 function(read_plainly file out)
@@ -12,6 +12,7 @@ function(read_plainly file out)
   set(${out} "${text}" PARENT_SCOPE)
 endfunction()
 
+string(REPLACE "," ";" SOURCES "${SOURCES}")
 set(sources "")
 foreach(source IN LISTS SOURCES)
   read_plainly(${source} text)

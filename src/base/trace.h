@@ -32,6 +32,7 @@ private:
 
 /// Traces a line: `ORV_TRACE(level) << "opened " << name;`. While the level is off, that costs one
 /// relaxed load and evaluates nothing to the right.
-// NOLINTNEXTLINE(bugprone-macro-parentheses): what is traced follows the macro
+// NOLINTBEGIN(bugprone-macro-parentheses): what is traced follows the macro
 #define ORV_TRACE(level) \
     !(level).isOn() ? void() : Orv::Trace::Discard() & Orv::Trace(level).stream()
+// NOLINTEND(bugprone-macro-parentheses)

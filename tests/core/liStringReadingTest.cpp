@@ -122,6 +122,24 @@ TEST(LiString, aNulThatComesOrGoesChangesWhereTheTextEnds) {
     EXPECT_EQ(stream.str(), "x");
 }
 
+TEST(LiString, knowsItsFirstNulAfterEveryReplacement) {
+    const std::vector<std::string> pieces{"\0"s, "x", "x\0"s, "\0x"s, "x\0y"s, "wxyz", "\0\0"s};
+    for (const std::string& start : {"abcdefgh"s, "ab\0defgh"s, "abc\0e\0gh"s}) {
+        for (const std::string& piece : pieces) {
+            for (std::size_t at = 0; at + piece.size() <= start.size(); ++at) {
+                std::string model = start;
+                model.replace(at, piece.size(), piece);
+                LiString string = makeString(start);
+                string.replace(static_cast<int>(at), makeString(piece));
+                EXPECT_EQ(textOf(string), model);
+                const LiString cText(model.c_str());
+                EXPECT_TRUE(!(string < cText) && !(cText < string)) << at;
+                EXPECT_EQ(string.hash(), cText.hash()) << at;
+            }
+        }
+    }
+}
+
 TEST(LiString, hashesEveryLengthAsTheRuleSays) {
     EXPECT_EQ(LiString().hash(), 0U);
     EXPECT_EQ(LiString("a").hash(), 97U);

@@ -23,7 +23,8 @@ void readProcessor(MtSystemReport& report) {
     const unsigned baseFamily = (signature >> 8) & 0xF;
     const unsigned extendedFamily = (signature >> 20) & 0xFF;
     const unsigned model = ((signature >> 4) & 0xF) | ((signature >> 12) & 0xF0);
-    report.processorLevel = static_cast<long>(baseFamily + (baseFamily == 15 ? extendedFamily : 0));
+    const unsigned family = baseFamily == 15 ? baseFamily + extendedFamily : baseFamily;
+    report.processorLevel = static_cast<long>(family);
     report.processorRevision = static_cast<long>(model) << 8 | static_cast<long>(signature & 0xF);
 }
 
