@@ -2,12 +2,12 @@
 
 #include <functional>
 
+#include "../kit/kitTesting.h"
 #include "devMgr.h"
 #include "devMgrPropertyObserverUtil.h"
 #include "devMgrPropertyValueUtil.h"
 #include "devRegistry.h"
 #include "devRegistryDeviceEntry.h"
-#include "../kit/kitTesting.h"
 
 namespace Orv {
 
