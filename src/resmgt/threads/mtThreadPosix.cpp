@@ -10,7 +10,6 @@
 
 #include "assertions.h"
 #include "mtProcessorsPosix.h"
-#include "mtStopSignalPosix.h"
 
 namespace Orv {
 
@@ -74,7 +73,6 @@ void MtThreadPosix::create(unsigned stackSize, Entry entry, void* data) {
     const Attributes attributes(stackSize);
     _entry = entry;
     _data = data;
-    _isTerminated.store(0, std::memory_order_relaxed);
     const int error = ::pthread_create(&_created, attributes.get(), run, this);
     ORV_ASSERT_SYS(error == 0,
                    "::pthread_create( &_threadHandle, &attributes, executeCb, this ) == 0", error);
@@ -82,7 +80,7 @@ void MtThreadPosix::create(unsigned stackSize, Entry entry, void* data) {
 
 void MtThreadPosix::enter() {
     adoptCurrent();
-    MtStopSignalPosix::receive(&_isTerminated);
+    MtStopSignalPosix::receive(&_stopOrder);
 }
 
 void MtThreadPosix::adoptCurrent() {
@@ -116,7 +114,7 @@ void MtThreadPosix::release() noexcept {
 }
 
 bool MtThreadPosix::terminate() {
-    return MtStopSignalPosix::send(_threadHandle, _isTerminated);
+    return MtStopSignalPosix::send(_threadHandle, _stopOrder);
 }
 
 void MtThreadPosix::setName(const char* name) noexcept {

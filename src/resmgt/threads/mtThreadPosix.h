@@ -1,13 +1,12 @@
 #pragma once
 
-#include <atomic>
-#include <cstdint>
 #include <pthread.h>
 #include <sys/types.h>
 
 #include "lkThreadId.h"
 #include "lkTimeLimit.h"
 #include "mtSchedulerPosix.h"
+#include "mtStopSignalPosix.h"
 
 namespace Orv {
 
@@ -35,6 +34,8 @@ public:
     bool waitForEnd(const LkTimeLimit& limit);
     void release() noexcept;
 
+    void suspend() noexcept {}  // a thread that is stopped finds the locks of others taken
+    void resume() noexcept {}
     bool terminate();
 
     void setName(const char* name) noexcept;  ///< On the thread itself.
@@ -51,7 +52,7 @@ private:
     pid_t _threadId = 0;
     LkThreadId _id;
     MtSchedulerPosix::State _applied;
-    std::atomic<std::uint32_t> _isTerminated{0};
+    MtStopSignalPosix::Order _stopOrder{0};
     Entry _entry = nullptr;
     void* _data = nullptr;
 

@@ -32,6 +32,9 @@ public:
     bool waitForEnd(const LkTimeLimit& limit);
     void release() noexcept;
 
+    // Threads that wait for a critical section must not be ended: who leaves it would wait for them.
+    void suspend() noexcept;
+    void resume() noexcept;
     bool terminate();
 
     void setName(const char* name) noexcept;  ///< On the thread itself.
