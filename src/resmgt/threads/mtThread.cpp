@@ -356,6 +356,7 @@ void MtThread::end(const std::exception_ptr& thrown) {
     const LkGuard guard(_lock);
     _thrown = thrown;
     _hasEnded = true;
+    _native->leave();
 }
 
 void MtThread::freeSpecificData() {

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <atomic>
+#include <cstdint>
 #include <pthread.h>
 #include <sys/types.h>
 
@@ -26,8 +28,9 @@ public:
     /// Makes a thread that runs entry(data).
     /// @param stackSize  bytes that the thread has for certain.
     void create(unsigned stackSize, Entry entry, void* data);
-    void enter();         ///< Called first on the new thread.
-    void adoptCurrent();  ///< Stands for the calling thread.
+    void enter();           ///< Called first on the new thread.
+    void leave() noexcept;  ///< Called on the thread when there is little left to do.
+    void adoptCurrent();    ///< Stands for the calling thread.
     void detach() noexcept;
 
     /// Once it has returned true, release() is due.
@@ -56,7 +59,12 @@ private:
     Entry _entry = nullptr;
     void* _data = nullptr;
 
+    // What a wait with a time limit goes by.
+    enum Progress : std::uint32_t { RUNS, IS_WATCHED, LEAVES };
+    std::atomic<std::uint32_t> _progress{RUNS};
+
     static void* run(void* native);
+    bool waitUntil(const LkTimeLimit& limit);
 };
 
 }  // namespace Orv

@@ -24,8 +24,9 @@ public:
     /// Makes a thread that runs entry(data).
     /// @param stackSize  bytes that the thread has for certain.
     void create(unsigned stackSize, Entry entry, void* data);
-    void enter();         ///< Called first on the new thread.
-    void adoptCurrent();  ///< Stands for the calling thread.
+    void enter();             ///< Called first on the new thread.
+    void leave() noexcept {}  ///< Called on the thread when there is little left to do.
+    void adoptCurrent();      ///< Stands for the calling thread.
     void detach() noexcept { release(); }
 
     /// Once it has returned true, release() is due.
