@@ -12,7 +12,7 @@ struct ThreadSlot::Platform {
     static constinit thread_local Values values;
     static constinit thread_local Values* watched;  // null until the thread is
 
-    static void notice(void* values) { tellAll(*static_cast<Values*>(values)); }
+    static void notice(void* ending) { tellAll(*static_cast<Values*>(ending)); }
 
     static pthread_key_t makeKey() {
         pthread_key_t key;

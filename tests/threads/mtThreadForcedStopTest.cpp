@@ -4,7 +4,7 @@
 #include "eventually.h"
 #include "expectThrows.h"
 #include "gate.h"
-#include "lkUnnamedSema.h"
+#include "lkEvent.h"
 #include "mtSpecificData.h"
 #include "mtSpecificDataRegistry.h"
 #include "threadTesting.h"
@@ -50,16 +50,18 @@ TEST_F(MtThreadForcedStop, endsTheThreadWithoutUnwindingAndItMayBeStartedAgain) 
     const MtSpecificData<Value> slot("slot");
     const std::size_t nbValuesBefore = registry.getNbValues();
     for (const bool doesWait : {true, false}) {
-        LkUnnamedSema never("never", 0);
+        LkEvent never("never", false);
         std::atomic<std::uint64_t> nbRounds{0};
         std::atomic<int> nbRuns{0};
-        TestCounter nbReady;
+        std::atomic<int> nbReady{0};
         const ObjPtr<MtThread> thread = makeThread("victim", [&](MtThread&) {
             const CountsDestructions onStack{nbDestroyed};
             EXPECT_EQ(slot.find(), nullptr) << "the value of an earlier thread";
             keptForLeakCheck.push_back(&slot.get());
             if (nbRuns++ == 3) return;
-            nbReady.add();
+            EXPECT_FALSE(never.timedWait(0.001));
+            // From here on it takes nothing along: no lock of the C library, none of the test.
+            ++nbReady;
             if (doesWait) never.wait();
             for (;;) ++nbRounds;
         });
@@ -67,7 +69,7 @@ TEST_F(MtThreadForcedStop, endsTheThreadWithoutUnwindingAndItMayBeStartedAgain) 
         for (int run = 1; run <= 3; ++run) {
             nbDestroyed = nbDeleted = 0;
             thread->start();
-            ASSERT_TRUE(nbReady.waitFor(run));
+            ASSERT_TRUE(eventually("it is ready", [&] { return nbReady == run; }));
             EXPECT_TRUE(thread->forceStop());
             EXPECT_TRUE(thread->timedJoin(30));
             EXPECT_FALSE(thread->isRunning());
@@ -85,10 +87,13 @@ TEST_F(MtThreadForcedStop, endsTheThreadWithoutUnwindingAndItMayBeStartedAgain) 
 }
 
 TEST_F(MtThreadForcedStop, releasesThoseWhoJoinAlready) {
-    LkUnnamedSema asleep("asleep", 0);
-    const ObjPtr<MtThread> thread = makeThread("victim", [&](MtThread&) { asleep.wait(); });
+    std::atomic<int> nbReady{0};
+    const ObjPtr<MtThread> thread = makeThread("victim", [&](MtThread&) {
+        for (;;) nbReady = 1;
+    });
     thread->setCancelable(true);
     thread->start();
+    ASSERT_TRUE(eventually("it is ready", [&] { return nbReady == 1; }));
     TestCounter nbJoined;
     std::vector<std::jthread> joiners;
     for (int i = 0; i < 4; ++i) {

@@ -154,6 +154,24 @@ TEST(MtThreadSchedulingPosix, threadsBlockSignalsFromOutside) {
     });
 }
 
+TEST(MtThreadSchedulingPosix, aForcedStopThatCannotBeDoneIsWithdrawn) {
+    if (IS_THREAD_SANITIZED) GTEST_SKIP() << "the sanitizer puts signals off";
+    const ErrandThread errand;
+    errand->setCancelable(true);
+    sigset_t all, before;
+    ::sigfillset(&all);
+    errand.run([&] { ::pthread_sigmask(SIG_SETMASK, &all, &before); });
+    EXPECT_FALSE(errand->forceStop());
+    bool hasRun = false;
+    errand.run([&] {
+        ::pthread_sigmask(SIG_SETMASK, &before, nullptr);
+        hasRun = true;
+    });
+    EXPECT_TRUE(hasRun);
+    errand->requestStop();
+    errand->join();
+}
+
 TEST(MtThreadSchedulingPosix, theCLibrarysOwnUnwindingPassesThrough) {
     struct Sets {
         bool& flag;

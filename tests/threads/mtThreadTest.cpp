@@ -157,8 +157,9 @@ public:
         _events.push_back(event);
     }
 
-private:
     static inline std::mutex mutex;
+
+private:
     std::vector<std::string>& _events;
 
     void performAttach(MtThread*) override { add("attached"); }
@@ -188,6 +189,11 @@ struct Recorded {
     RecordingProtocol* protocol = new RecordingProtocol(events);
     ObjPtr<MtThread> thread =
         MtThreadFactory::getInstance().create("recorded", ObjPtr<MtThreadProtocol>(protocol));
+
+    bool has(const char* event) const {
+        const std::lock_guard guard(RecordingProtocol::mutex);
+        return std::count(events.begin(), events.end(), event) > 0;
+    }
 };
 
 struct ThrowingValue {
@@ -404,22 +410,11 @@ TEST(MtThread, destroyingARunningThreadStopsItJoinsItAndThenLetsTheProtocolGo) {
               (Events{"attached", "stop", "canceled", "finished", "detached", "destroyed"}));
 }
 
-/// Opens a gate when the thread's own objects go.
-struct OpensAtEnd {
-    Gate* gate = nullptr;
-    ~OpensAtEnd() {
-        if (gate != nullptr) gate->open();
-    }
-};
-thread_local OpensAtEnd opensAtEnd;
-
 TEST(MtThread, destroyingItselfIsAnAssertionThatTheThreadSurvives) {
     const std::size_t nbBefore = MtThreadMgr::getInstance().getNbThreads();
     const MtSpecificData<std::unique_ptr<int>> slot("slot");
     Recorded recorded;
-    Gate isGone;
     recorded.protocol->body = [&](MtThread&) {
-        opensAtEnd.gate = &isGone;
         slot.get() = std::make_unique<int>(1);
         expectAsserts("!isOnItself", [&] { recorded.thread.reset(); });
         EXPECT_EQ(MtThreadMgr::findCurrentThread(), nullptr);
@@ -427,8 +422,7 @@ TEST(MtThread, destroyingItselfIsAnAssertionThatTheThreadSurvives) {
         EXPECT_EQ(MtThreadMgr::getInstance().getNbThreads(), nbBefore);
     };
     recorded.thread->start();
-    ASSERT_TRUE(isGone.wait());
-    EXPECT_EQ(recorded.events.back(), "destroyed");
+    eventually("the protocol has gone", [&] { return recorded.has("destroyed"); });
 }
 
 class RefusesProtocol : public MtThreadProtocol {
@@ -439,7 +433,7 @@ class RefusesProtocol : public MtThreadProtocol {
 TEST(MtThread, aThreadWhoseProtocolRefusesItLeavesNothingBehind) {
     MtThreadMgr& mgr = MtThreadMgr::getInstance();
     const std::size_t nbBefore = mgr.getNbThreads();
-    EXPECT_THROW(MtThreadFactory::getInstance().create(
+    EXPECT_THROW(ObjPtr<MtThread> thread = MtThreadFactory::getInstance().create(
                      "refused", ObjPtr<MtThreadProtocol>(new RefusesProtocol)),
                  std::runtime_error);
     EXPECT_EQ(mgr.getNbThreads(), nbBefore);

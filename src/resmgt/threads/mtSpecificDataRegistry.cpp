@@ -125,11 +125,6 @@ void MtSpecificDataRegistry::removeSlot(const MtOpaqueData* data) noexcept {
     }
 }
 
-void MtSpecificDataRegistry::whileLocked(const std::function<void()>& action) const {
-    const LkGuard guard(_lock);
-    action();
-}
-
 std::size_t MtSpecificDataRegistry::getNbValues() const {
     const LkGuard guard(_lock);
     return _entries.size();

@@ -2,7 +2,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <map>
 
 #include "lkRecLock.h"
@@ -39,8 +38,8 @@ public:
     /// been at work on any of them.
     void forgetThread(std::uintptr_t number) noexcept;
 
-    /// For an action during which no other thread may stand in the registry.
-    void whileLocked(const std::function<void()>& action) const;
+    /// For a forced stop, which must not take it along.
+    const LkRecLock& getLock() const noexcept { return _lock; }
 
     /// The calling thread's number, by which values are kept: unlike the system's it never comes
     /// back. 0 once the thread's end has been dealt with; what is made then stays until its slot

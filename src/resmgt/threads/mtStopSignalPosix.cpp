@@ -15,7 +15,9 @@ namespace {
 
 constexpr double LONGEST_WAIT_SECONDS = 1.0;
 
-constinit thread_local std::atomic<std::uint32_t>* receiver = nullptr;
+enum : std::uint32_t { NONE, GIVEN, TAKEN };  // values of an order
+
+constinit thread_local MtStopSignalPosix::Order* receiver = nullptr;
 
 /// The C library gives the stack of a thread to a later one, together with the values of its keys,
 /// which a thread that ends in the usual way leaves empty. Only writes to the thread's own memory.
@@ -26,12 +28,13 @@ void clearKeys() {
 }
 
 void endThread(int, siginfo_t* info, void*) {
-    std::atomic<std::uint32_t>* const isEnded = receiver;
+    MtStopSignalPosix::Order* const order = receiver;
     if (info->si_code != SI_QUEUE || info->si_pid != ::getpid()) return;
-    if (isEnded == nullptr || info->si_value.sival_ptr != isEnded) return;  // for an earlier thread
+    if (order == nullptr || info->si_value.sival_ptr != order) return;  // for an earlier thread
+    std::uint32_t state = GIVEN;
+    if (!order->compare_exchange_strong(state, TAKEN, std::memory_order_acq_rel)) return;
     clearKeys();
-    isEnded->store(1, std::memory_order_release);
-    ::syscall(SYS_futex, isEnded, FUTEX_WAKE_PRIVATE, INT_MAX, nullptr, nullptr, 0);
+    ::syscall(SYS_futex, order, FUTEX_WAKE_PRIVATE, INT_MAX, nullptr, nullptr, 0);
     for (;;) ::syscall(SYS_exit, 0);
 }
 
@@ -69,22 +72,24 @@ const sigset_t& MtStopSignalPosix::getBlockedSignals() {
     return blocked;
 }
 
-void MtStopSignalPosix::receive(std::atomic<std::uint32_t>* isEnded) noexcept {
-    receiver = isEnded;
+void MtStopSignalPosix::receive(Order* order) noexcept {
+    if (order != nullptr) order->store(NONE, std::memory_order_relaxed);
+    receiver = order;
 }
 
-bool MtStopSignalPosix::send(pthread_t thread, std::atomic<std::uint32_t>& isEnded) {
+bool MtStopSignalPosix::send(pthread_t thread, Order& order) {
     ORV_ASSERT_TEXT(getSignal() != 0, "a real-time signal is free");
     sigval value;
-    value.sival_ptr = &isEnded;
+    value.sival_ptr = &order;
+    order.store(GIVEN, std::memory_order_release);
     const int error = ::pthread_sigqueue(thread, getSignal(), value);
     if (error == ESRCH) return true;  // it has ended by itself
     ORV_ASSERT_SYS(error == 0, "::pthread_sigqueue( _threadHandle, signal, value ) == 0", error);
     const LkTimeLimit limit(LONGEST_WAIT_SECONDS);
-    while (isEnded.load(std::memory_order_acquire) == 0) {
-        if (!LkAddressWaitPosix::wait(&isEnded, 0, limit)) {
-            return isEnded.load(std::memory_order_acquire) != 0;
-        }
+    while (order.load(std::memory_order_acquire) == GIVEN) {
+        if (LkAddressWaitPosix::wait(&order, GIVEN, limit)) continue;
+        std::uint32_t state = GIVEN;
+        return !order.compare_exchange_strong(state, NONE, std::memory_order_acq_rel);
     }
     return true;
 }

@@ -17,11 +17,15 @@ public:
     /// What a thread blocks that this is to reach: every asynchronous signal but the one.
     static const sigset_t& getBlockedSignals();
 
-    /// Names the calling thread: only a signal for this word ends it. Null: none does.
-    static void receive(std::atomic<std::uint32_t>* isEnded) noexcept;
+    /// The order to end, given to one thread: 0 before it.
+    using Order = std::atomic<std::uint32_t>;
 
-    /// @return whether the thread has set the word, on its way out, within a second.
-    static bool send(pthread_t thread, std::atomic<std::uint32_t>& isEnded);
+    /// From now on the calling thread takes this order; null: none.
+    static void receive(Order* order) noexcept;
+
+    /// @return whether the thread has taken the order, on its way out, within a second. Else the
+    ///   order is withdrawn.
+    static bool send(pthread_t thread, Order& order);
 };
 
 }  // namespace Orv

@@ -19,6 +19,7 @@
 #include "mtThreadLevels.h"
 #include "mtThreadMgr.h"
 #include "mtThreadMgrImpPrivate.h"
+#include "mtUtil.h"
 #include "threadSlot.h"
 #include "trace.h"
 #include "traceManager.h"
@@ -54,6 +55,8 @@ namespace {
 
 std::atomic<bool> isStartAllowed{false};
 std::atomic<bool> isRefusalTraced{false};
+
+constexpr double LONGEST_FORCED_STOP_SECONDS = 1.0;
 
 void traceRefusal(const LiString& thread) {
     if (isRefusalTraced.exchange(true, std::memory_order_relaxed)) return;
@@ -353,6 +356,7 @@ void MtThread::end(const std::exception_ptr& thrown) {
     const LkGuard guard(_lock);
     _thrown = thrown;
     _hasEnded = true;
+    _native->leave();
 }
 
 void MtThread::freeSpecificData() {
@@ -397,8 +401,7 @@ bool MtThread::isCancelable() const {
 }
 
 bool MtThread::forceStop() {
-    bool isStopped = false;
-    MtThreadMgr::get().imp().getThreads().whileLocked([&] {
+    {
         const LkGuard guard(_lock);
         if (!_isCancelable) {
             Assertions::throwProgramAborted(ORV_FILE, __LINE__, "_cancelable is FALSE!!!");
@@ -406,19 +409,30 @@ bool MtThread::forceStop() {
         ORV_ASSERT(isRunningNoLock());
         ORV_ASSERT(!_isMainThread);
         ORV_ASSERT(!isCurrentThread());
-        isStopped = _hasEnded || terminateNoLock();
-    });
+    }
+    const LkTimeLimit limit(LONGEST_FORCED_STOP_SECONDS);
+    bool isStopped = false;
+    while (!(isStopped = tryForceStop()) && limit.getRemainingMilliseconds() > 0) MtUtil::yield();
     if (_protocol) _protocol->performCanceled(this);
     return isStopped;
 }
 
-/// With all locks held that every thread of the process needs now and then: none is taken along.
-bool MtThread::terminateNoLock() {
+/// Ends the thread at a moment when it holds none of the locks that every thread of the process
+/// needs now and then, nor is on its way out, where the system holds some. While it is suspended it
+/// may hold any lock of the C library: nothing is allocated.
+bool MtThread::tryForceStop() {
+    const LkRecLock& listLock = MtThreadMgr::get().imp().getThreads().getLock();
+    const LkRecLock& dataLock = MtSpecificDataRegistry::getInstance().getLock();
     bool isStopped = false;
-    MtSpecificDataRegistry::getInstance().whileLocked([&] {
-        isStopped = _native->terminate();
-        _isForced = true;
-    });
+    _native->suspend();
+    if (!listLock.isLocked() && !_lock.isLocked() && !dataLock.isLocked()) {
+        const LkGuard listGuard(listLock);
+        const LkGuard guard(_lock);
+        const LkGuard dataGuard(dataLock);
+        if (!_hasEnded && !_isForced) _isForced = _native->terminate();
+        isStopped = _hasEnded || _isForced;
+    }
+    _native->resume();
     return isStopped;
 }
 

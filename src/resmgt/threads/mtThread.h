@@ -73,8 +73,8 @@ public:
 
     /// The last resort: ends the thread where it stands, without unwinding. What it holds stays
     /// held, locks of the C library included, and its thread data is not deleted.
-    /// @return false if the system has not done it within a second, because the thread blocks all
-    ///   signals; it ends when it no longer does.
+    /// @return false if it could not be done within a second, for instance because the thread
+    ///   blocks all signals; the thread then runs on, and may be forced again.
     bool forceStop();
 
     // Scheduling
@@ -170,7 +170,7 @@ private:
     bool waitForEnd(const LkTimeLimit& limit, std::uint64_t& run);
     bool waitForJoiner(const LkTimeLimit& limit);
     void noteEndNoLock() ORV_REQUIRES(_lock);
-    bool terminateNoLock() ORV_REQUIRES(_lock);
+    bool tryForceStop();
     void throwThrown(std::uint64_t run);
     void traceThrownNoLock() noexcept ORV_REQUIRES(_lock);
 

@@ -35,7 +35,9 @@ public:
 
     /// The same under the lock, for actions that take no lock but those of threads.
     void forEachLocked(const std::function<void(MtThread&)>& action) const;
-    void whileLocked(const std::function<void()>& action) const;
+
+    /// For a forced stop, which must not take it along.
+    const LkRecLock& getLock() const noexcept { return _lock; }
 
     std::size_t getSize() const;
     std::vector<LiString> getNames() const;

@@ -3,20 +3,20 @@
 #include <algorithm>
 #include <cerrno>
 #include <chrono>
-#include <cstring>
-#include <ctime>
 #include <sys/prctl.h>
+#include <thread>
 #include <unistd.h>
 
 #include "assertions.h"
+#include "lkAddressWaitPosix.h"
 #include "mtProcessorsPosix.h"
-#include "mtStopSignalPosix.h"
 
 namespace Orv {
 
 namespace {
 
 constexpr std::size_t SMALLEST_RESERVE = 1 << 20;  // as Windows has it
+constexpr std::chrono::microseconds LONGEST_PAUSE(1000);
 
 /// How a thread is to be made.
 class Attributes {
@@ -54,14 +54,6 @@ private:
     }
 };
 
-timespec toDeadline(const LkTimeLimit& limit) {
-    using namespace std::chrono;
-    const auto time = limit.getDeadline().time_since_epoch();
-    const auto whole = duration_cast<seconds>(time);
-    return {static_cast<std::time_t>(whole.count()),
-            static_cast<long>(duration_cast<nanoseconds>(time - whole).count())};
-}
-
 }  // namespace
 
 void* MtThreadPosix::run(void* native) {
@@ -74,7 +66,7 @@ void MtThreadPosix::create(unsigned stackSize, Entry entry, void* data) {
     const Attributes attributes(stackSize);
     _entry = entry;
     _data = data;
-    _isTerminated.store(0, std::memory_order_relaxed);
+    _progress = RUNS;
     const int error = ::pthread_create(&_created, attributes.get(), run, this);
     ORV_ASSERT_SYS(error == 0,
                    "::pthread_create( &_threadHandle, &attributes, executeCb, this ) == 0", error);
@@ -82,7 +74,11 @@ void MtThreadPosix::create(unsigned stackSize, Entry entry, void* data) {
 
 void MtThreadPosix::enter() {
     adoptCurrent();
-    MtStopSignalPosix::receive(&_isTerminated);
+    MtStopSignalPosix::receive(&_stopOrder);
+}
+
+void MtThreadPosix::leave() noexcept {
+    if (_progress.exchange(LEAVES) == IS_WATCHED) LkAddressWaitPosix::wakeAll(&_progress);
 }
 
 void MtThreadPosix::adoptCurrent() {
@@ -98,16 +94,27 @@ void MtThreadPosix::detach() noexcept {
 }
 
 bool MtThreadPosix::waitForEnd(const LkTimeLimit& limit) {
-    int error = 0;
-    if (limit.isInfinite()) {
-        error = ::pthread_join(_created, nullptr);
-    } else {
-        const timespec deadline = toDeadline(limit);
-        error = ::pthread_clockjoin_np(_created, nullptr, CLOCK_MONOTONIC, &deadline);
-        if (error == ETIMEDOUT) return false;
-    }
+    if (!limit.isInfinite()) return waitUntil(limit);
+    const int error = ::pthread_join(_created, nullptr);
     ORV_ASSERT_SYS(error == 0, "::pthread_join( _threadHandle, nullptr ) == 0", error);
     return true;
+}
+
+/// The C library's own join with a time limit goes by the wall clock, or past the sanitizers. When
+/// the thread leaves there is little left of it, and that is looked at again and again.
+bool MtThreadPosix::waitUntil(const LkTimeLimit& limit) {
+    for (std::uint32_t progress = RUNS; progress != LEAVES; progress = _progress) {
+        if (progress == RUNS && !_progress.compare_exchange_strong(progress, IS_WATCHED)) continue;
+        if (!LkAddressWaitPosix::wait(&_progress, IS_WATCHED, limit)) break;
+    }
+    for (std::chrono::microseconds pause(20);; pause = std::min(2 * pause, LONGEST_PAUSE)) {
+        const int error = ::pthread_tryjoin_np(_created, nullptr);
+        if (error == 0) return true;
+        ORV_ASSERT_SYS(error == EBUSY, "::pthread_tryjoin_np( _threadHandle, nullptr ) == 0",
+                       error);
+        if (limit.getRemainingMilliseconds() == 0) return false;
+        std::this_thread::sleep_for(pause);
+    }
 }
 
 void MtThreadPosix::release() noexcept {
@@ -116,7 +123,9 @@ void MtThreadPosix::release() noexcept {
 }
 
 bool MtThreadPosix::terminate() {
-    return MtStopSignalPosix::send(_threadHandle, _isTerminated);
+    if (!MtStopSignalPosix::send(_threadHandle, _stopOrder)) return false;
+    leave();
+    return true;
 }
 
 void MtThreadPosix::setName(const char* name) noexcept {

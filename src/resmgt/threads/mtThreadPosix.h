@@ -8,6 +8,7 @@
 #include "lkThreadId.h"
 #include "lkTimeLimit.h"
 #include "mtSchedulerPosix.h"
+#include "mtStopSignalPosix.h"
 
 namespace Orv {
 
@@ -27,14 +28,17 @@ public:
     /// Makes a thread that runs entry(data).
     /// @param stackSize  bytes that the thread has for certain.
     void create(unsigned stackSize, Entry entry, void* data);
-    void enter();         ///< Called first on the new thread.
-    void adoptCurrent();  ///< Stands for the calling thread.
+    void enter();           ///< Called first on the new thread.
+    void leave() noexcept;  ///< Called on the thread when there is little left to do.
+    void adoptCurrent();    ///< Stands for the calling thread.
     void detach() noexcept;
 
     /// Once it has returned true, release() is due.
     bool waitForEnd(const LkTimeLimit& limit);
     void release() noexcept;
 
+    void suspend() noexcept {}  // a thread that is stopped finds the locks of others taken
+    void resume() noexcept {}
     bool terminate();
 
     void setName(const char* name) noexcept;  ///< On the thread itself.
@@ -51,11 +55,16 @@ private:
     pid_t _threadId = 0;
     LkThreadId _id;
     MtSchedulerPosix::State _applied;
-    std::atomic<std::uint32_t> _isTerminated{0};
+    MtStopSignalPosix::Order _stopOrder{0};
     Entry _entry = nullptr;
     void* _data = nullptr;
 
+    // What a wait with a time limit goes by.
+    enum Progress : std::uint32_t { RUNS, IS_WATCHED, LEAVES };
+    std::atomic<std::uint32_t> _progress{RUNS};
+
     static void* run(void* native);
+    bool waitUntil(const LkTimeLimit& limit);
 };
 
 }  // namespace Orv

@@ -82,6 +82,18 @@ void MtThreadWindows::release() noexcept {
     _id.reset();
 }
 
+/// Returns when the thread stands still, for which the system has to be asked where it stands.
+void MtThreadWindows::suspend() noexcept {
+    CONTEXT context{};
+    context.ContextFlags = CONTEXT_CONTROL;
+    if (::SuspendThread(_threadHandle) == static_cast<DWORD>(-1)) return;
+    ::GetThreadContext(_threadHandle, &context);
+}
+
+void MtThreadWindows::resume() noexcept {
+    ::ResumeThread(_threadHandle);
+}
+
 bool MtThreadWindows::terminate() {
     ORV_ASSERT_SYS(::TerminateThread(_threadHandle, 0), "::TerminateThread( _threadHandle, 0 )",
                    OsError::getLast());

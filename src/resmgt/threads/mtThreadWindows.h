@@ -24,14 +24,18 @@ public:
     /// Makes a thread that runs entry(data).
     /// @param stackSize  bytes that the thread has for certain.
     void create(unsigned stackSize, Entry entry, void* data);
-    void enter();         ///< Called first on the new thread.
-    void adoptCurrent();  ///< Stands for the calling thread.
+    void enter();             ///< Called first on the new thread.
+    void leave() noexcept {}  ///< Called on the thread when there is little left to do.
+    void adoptCurrent();      ///< Stands for the calling thread.
     void detach() noexcept { release(); }
 
     /// Once it has returned true, release() is due.
     bool waitForEnd(const LkTimeLimit& limit);
     void release() noexcept;
 
+    // Threads that wait for a critical section must not be ended: who leaves it would wait for them.
+    void suspend() noexcept;
+    void resume() noexcept;
     bool terminate();
 
     void setName(const char* name) noexcept;  ///< On the thread itself.
