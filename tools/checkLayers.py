@@ -22,7 +22,9 @@ FOLDERS = {
     "priority": ["priorities"], "rt": ["priorities"],
 }
 # The exceptions of the device layer stand below it, with the state machines, which throw them too.
-PLACED_BY_HAND = {"devMgrEx": ["statemachine"], "devPrtclEx": ["statemachine"]}
+# The container asks the graph of the device kit's waits, and only the device queues are made of it.
+PLACED_BY_HAND = {"devMgrEx": ["statemachine"], "devPrtclEx": ["statemachine"],
+                  "mtContainer": ["kit"]}
 
 
 class Tree:
