@@ -98,17 +98,14 @@ void MbBufferImp::waitForChange() {
 // ---------------------------------------------------------------------------------- transitions
 
 void MbBufferImp::transition(MbStateId next) {
-    const LkThreadId ownerBefore = _transientStateOwner;
     const MbState& before = *_state.load(std::memory_order_relaxed);
     std::exception_ptr failure;
-    _transientStateOwner.setCurrentThread();
     try {
         follow(next);
     } catch (...) {
         failure = std::current_exception();
         restore(before);
     }
-    _transientStateOwner = ownerBefore;
     if (_pendingEvents != 0) deliverPending(failure);
     if (_nbWaiting.load(std::memory_order_relaxed) > 0) _pulse.pulse();
     if (failure) std::rethrow_exception(failure);

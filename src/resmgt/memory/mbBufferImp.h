@@ -37,6 +37,7 @@ enum class MbInitialState { FREED, UNLOADED };
 /// - Threads: every member by any thread that holds the buffer through a counted pointer. Calls of
 ///   the protocol and waits for room run with the mutex released and their thread recorded: if that
 ///   thread has to wait for this buffer, it gets the assertion "! _transientStateOwner.isCurrentThread()".
+/// - Memory: starts at a cache line, so that threads with different buffers do not meet.
 /// - Ownership: counted; the last holder to go destroys it. An asynchronous operation holds it too.
 /// - Errors: each event throws MbEx::ExIllegalTransition where the state refuses it, and what the
 ///   protocol and the manager throw, after which the state before stands again.
@@ -98,7 +99,7 @@ private:
 
     ~MbBufferImp();
 
-    const LiString _name;
+    alignas(64) const LiString _name;
     const int _size;
     const MbAlignment _alignment;
     const RCShdPtr<MbManager> _manager;

@@ -13,7 +13,7 @@ struct MbPoolEntry {
     std::atomic<std::uint64_t> unloadableSince{0};  ///< 0: it is not unloadable.
     std::atomic<bool> isNoted{false};
     MbBufferImp* nextNoted = nullptr;
-    std::uint64_t insertedSince = 0;  ///< What the strategy knows; 0: not inserted.
+    std::atomic<std::uint64_t> insertedSince{0};  ///< What the strategy knows; 0: not inserted.
 
     // The pool's list of its buffers
     MbBufferImp* previous = nullptr;

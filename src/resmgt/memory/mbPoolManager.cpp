@@ -81,6 +81,11 @@ void MbPoolManager::evict(MbBufferImp& victim, Guard& guard) {
     }
     guard.unlock();
     held->unload();
+    if (victim.getPoolEntry().insertedSince != 0) {  // it was in use, or is again
+        guard.lock();
+        MbUnloadNotes::withdrawLocked(*_strategy, victim);
+        guard.unlock();
+    }
     held.reset();  // may destroy it, which takes the mutex
     guard.lock();
 }
@@ -97,6 +102,7 @@ void MbPoolManager::deallocateRegion(MbBufferImp* buffer) {
     const LkGuard guard(_mutex);
     // A buffer without memory is in no list. What the strategy refuses stays noted for others.
     static_cast<void>(_notes->applyTo(*_strategy));
+    MbUnloadNotes::withdraw(*_strategy, *buffer);
     _bytesInUse -= buffer->getRegion().getBlockBytes();
     performDeallocate(buffer);
     --_nbRegions;
@@ -104,11 +110,11 @@ void MbPoolManager::deallocateRegion(MbBufferImp* buffer) {
 }
 
 void MbPoolManager::bufferNotUnloadable(MbBufferImp* buffer) {
-    _notes->note(*buffer, false);
+    _notes->noteNotUnloadable(*buffer);
 }
 
 void MbPoolManager::bufferUnloadable(MbBufferImp* buffer) {
-    _notes->note(*buffer, true);
+    _notes->noteUnloadable(*buffer);
     // In one order with the count: either it is seen here, or who seeks sees the note.
     if (_nbSeeking != 0) _pulse.pulse();
 }

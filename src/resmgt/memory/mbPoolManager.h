@@ -11,6 +11,7 @@
 #include "mbManager.h"
 #include "mbUnloadStrategy.h"
 #include "objPtr.h"
+#include "threadSafety.h"
 
 namespace Orv {
 
@@ -83,7 +84,7 @@ private:
 
     bool allocateNow(MbBufferImp* buffer);
     void makeRoom(Guard& guard);
-    void evict(MbBufferImp& victim, Guard& guard);
+    void evict(MbBufferImp& victim, Guard& guard) ORV_NO_THREAD_SAFETY_ANALYSIS;
     void waitForRoom(Guard& guard);
 };
 

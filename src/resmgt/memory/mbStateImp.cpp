@@ -6,13 +6,16 @@
 
 namespace Orv {
 
-MbStateImp::Outside::Outside(MbBufferImp& buffer) : _buffer(buffer), _guard(*buffer._guard) {
+MbStateImp::Outside::Outside(MbBufferImp& buffer)
+    : _buffer(buffer), _guard(*buffer._guard), _ownerBefore(buffer._transientStateOwner) {
+    buffer._transientStateOwner.setCurrentThread();
     _guard.unlock();
 }
 
 MbStateImp::Outside::~Outside() noexcept(false) {
     _guard.lock();
     _buffer._guard = &_guard;
+    _buffer._transientStateOwner = _ownerBefore;
 }
 
 bool MbStateImp::receive(MbBufferImp& buffer, MbEvent event) const {

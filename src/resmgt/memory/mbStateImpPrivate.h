@@ -55,7 +55,8 @@ private:
     static void removeLock(MbBufferImp& buffer, MbStateId whenNone);
 };
 
-/// For a scope the buffer's mutex is free; the thread stays the owner of the transition.
+/// For a scope the buffer's mutex is free, and the thread recorded as the one that leads on: nobody
+/// can ask for it otherwise, so a transition that keeps the mutex does not record its thread.
 class MbStateImp::Outside {
 public:
     explicit Outside(MbBufferImp& buffer);
@@ -66,6 +67,7 @@ public:
 private:
     MbBufferImp& _buffer;
     MbBufferImp::Guard& _guard;
+    const LkThreadId _ownerBefore;
 };
 
 template <class Call>

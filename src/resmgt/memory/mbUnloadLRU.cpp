@@ -4,58 +4,52 @@
 #include <ostream>
 
 #include "assertions.h"
-#include "mbBufferIndexPrivate.h"
+#include "mbBufferNumbersPrivate.h"
 
 namespace Orv {
 
-/// A list through an array: what was used last stands at the tail. Number 0 is head and tail.
+/// A ring through the records: what was used last stands before the head, which is no buffer's.
 class MbUnloadLRU::Books {
 public:
     explicit Books(std::size_t nbBuffers) {
-        _nodes.reserve(nbBuffers + 1);
-        _nodes.push_back({});
-        _index.reserve(nbBuffers);
+        _numbers.reserve(nbBuffers + 1);
+        const std::uint32_t head = _numbers.insert(nullptr);
+        _numbers[head] = {head, head};
     }
 
     bool append(MbBufferImp* buffer) {
-        if (_index.find(buffer) != MbBufferIndex::NONE) return false;
-        _index.reserve(_index.getNbBuffers() + 1);
-        if (_free == 0) _nodes.push_back({});  // the last that may throw
-        const std::uint32_t number =
-            _free != 0 ? _free : static_cast<std::uint32_t>(_nodes.size() - 1);
-        if (_free != 0) _free = _nodes[number].next;
-        Node& end = _nodes[0];
-        _nodes[number] = {buffer, end.previous, 0};
-        _nodes[end.previous].next = number;
-        end.previous = number;
-        _index.insert(buffer, number);
+        const std::size_t nbBefore = _numbers.getNbIn();
+        const std::uint32_t number = _numbers.insert(buffer);
+        if (_numbers.getNbIn() == nbBefore) return false;
+        const std::uint32_t last = _numbers[HEAD].previous;
+        _numbers[number] = {last, HEAD};
+        _numbers[last].next = number;
+        _numbers[HEAD].previous = number;
         return true;
     }
 
     bool remove(MbBufferImp* buffer) noexcept {
-        const std::uint32_t number = _index.remove(buffer);
-        if (number == MbBufferIndex::NONE) return false;
-        const Node node = _nodes[number];
-        _nodes[node.previous].next = node.next;
-        _nodes[node.next].previous = node.previous;
-        _nodes[number].next = _free;
-        _free = number;
+        const std::uint32_t number = _numbers.find(buffer);
+        if (number == Numbers::NONE) return false;
+        const Links links = _numbers[number];
+        _numbers[links.previous].next = links.next;
+        _numbers[links.next].previous = links.previous;
+        _numbers.remove(number);
         return true;
     }
 
-    MbBufferImp* getFirst() const noexcept { return _nodes[_nodes[0].next].buffer; }
-    std::size_t getNbBuffers() const noexcept { return _index.getNbBuffers(); }
+    MbBufferImp* getFirst() noexcept { return _numbers.getBuffer(_numbers[HEAD].next); }
+    std::size_t getNbBuffers() const noexcept { return _numbers.getNbIn() - 1; }
 
 private:
-    struct Node {
-        MbBufferImp* buffer = nullptr;
+    struct Links {
         std::uint32_t previous = 0;
         std::uint32_t next = 0;
     };
+    using Numbers = MbBufferNumbers<Links>;
 
-    DaBookVector<Node> _nodes;
-    std::uint32_t _free = 0;  // first of the unused ones, linked by next
-    MbBufferIndex _index;
+    static constexpr std::uint32_t HEAD = 0;
+    Numbers _numbers;
 };
 
 MbUnloadLRU::MbUnloadLRU(int nbBuffers)

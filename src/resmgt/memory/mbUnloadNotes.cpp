@@ -20,11 +20,18 @@ std::uint64_t now() noexcept {
 
 MbUnloadNotes::~MbUnloadNotes() = default;
 
-void MbUnloadNotes::note(MbBufferImp& buffer, bool isUnloadable) noexcept {
+void MbUnloadNotes::noteUnloadable(MbBufferImp& buffer) noexcept {
     MbPoolEntry& entry = buffer.getPoolEntry();
     // In one order with takeAll(): either it sees this stamp, or the flag is found cleared here.
-    entry.unloadableSince.store(isUnloadable ? now() : 0, std::memory_order_seq_cst);
+    entry.unloadableSince.store(now(), std::memory_order_seq_cst);
     if (!entry.isNoted.load(std::memory_order_seq_cst)) push(buffer);
+}
+
+void MbUnloadNotes::noteNotUnloadable(MbBufferImp& buffer) noexcept {
+    // In no order with takeAll(), which is cheaper: it may miss this.
+    MbPoolEntry& entry = buffer.getPoolEntry();
+    entry.unloadableSince.store(0, std::memory_order_relaxed);
+    if (!entry.isNoted.load(std::memory_order_relaxed)) push(buffer);
 }
 
 void MbUnloadNotes::push(MbBufferImp& buffer) noexcept {
@@ -55,12 +62,12 @@ std::exception_ptr MbUnloadNotes::applyTo(MbUnloadStrategy& strategy) noexcept {
               [](const Note& left, const Note& right) { return left.since < right.since; });
     for (const Note& note : _batch) {
         MbPoolEntry& entry = note.buffer->getPoolEntry();
-        if (entry.insertedSince == note.since) continue;
+        if (entry.insertedSince.load(std::memory_order_relaxed) == note.since) continue;
         withdraw(strategy, *note.buffer);
         if (note.since == 0) continue;
         try {
             strategy.insertBuffer(note.buffer);
-            entry.insertedSince = note.since;
+            entry.insertedSince.store(note.since, std::memory_order_relaxed);
         } catch (...) {
             failure = std::current_exception();
             push(*note.buffer);
@@ -71,12 +78,18 @@ std::exception_ptr MbUnloadNotes::applyTo(MbUnloadStrategy& strategy) noexcept {
 }
 
 void MbUnloadNotes::withdraw(MbUnloadStrategy& strategy, MbBufferImp& buffer) noexcept {
-    if (std::exchange(buffer.getPoolEntry().insertedSince, 0) == 0) return;
+    std::atomic<std::uint64_t>& insertedSince = buffer.getPoolEntry().insertedSince;
+    if (insertedSince.load(std::memory_order_relaxed) == 0) return;
+    insertedSince.store(0, std::memory_order_relaxed);
     try {
         strategy.removeBuffer(&buffer);
     } catch (...) {
         Assertions::traceCurrentException("removing a buffer from its unload strategy");
     }
+}
+
+void MbUnloadNotes::withdrawLocked(MbUnloadStrategy& strategy, MbBufferImp& buffer) noexcept {
+    if (buffer.getPoolEntry().unloadableSince.load() == 0) withdraw(strategy, buffer);
 }
 
 }  // namespace Orv

@@ -18,7 +18,8 @@ class MbUnloadStrategy;
 /// no lock of the pool: it stamps the buffer, and puts it on a list unless it is there already. The
 /// list is applied to the strategy, in the order of the stamps, when the strategy is to be used.
 ///
-/// - Threads: note() by the thread that holds the buffer's mutex; all else under the pool's.
+/// - Threads: the first two by the thread that holds the buffer's mutex; what is applied and withdrawn,
+///   under the pool's.
 class MbUnloadNotes {
 public:
     MbUnloadNotes() = default;
@@ -27,7 +28,11 @@ public:
     MbUnloadNotes(const MbUnloadNotes&) = delete;
     MbUnloadNotes& operator=(const MbUnloadNotes&) = delete;
 
-    void note(MbBufferImp& buffer, bool isUnloadable) noexcept;
+    void noteUnloadable(MbBufferImp& buffer) noexcept;
+
+    /// May stay unknown to the strategy: who selects the buffer finds that it does not unload, and
+    /// withdraws it.
+    void noteNotUnloadable(MbBufferImp& buffer) noexcept;
 
     /// Makes room for the notes of so many buffers.
     void reserve(std::size_t nbBuffers) { _batch.reserve(nbBuffers); }
@@ -38,6 +43,9 @@ public:
 
     /// Takes a buffer out of the strategy, if it is in.
     static void withdraw(MbUnloadStrategy& strategy, MbBufferImp& buffer) noexcept;
+
+    /// The same, if the buffer is not unloadable.
+    static void withdrawLocked(MbUnloadStrategy& strategy, MbBufferImp& buffer) noexcept;
 
 private:
     struct Note {

@@ -4,60 +4,68 @@
 #include <ostream>
 
 #include "assertions.h"
-#include "mbBufferIndexPrivate.h"
+#include "mbBufferNumbersPrivate.h"
 #include "rnNumRecUniformRng.h"
 
 namespace Orv {
 
-/// The buffers in an array without gaps, and where each of them stands.
+/// The buffers' numbers in an array without gaps, and where in it each of them stands.
 class MbUnloadRandom::Books {
 public:
-    explicit Books(std::size_t nbBuffers) { _buffers.reserve(nbBuffers); }
+    explicit Books(std::size_t nbBuffers) {
+        _numbers.reserve(nbBuffers);
+        _array.reserve(nbBuffers);
+    }
 
     bool append(MbBufferImp* buffer) {
-        if (_index.find(buffer) != MbBufferIndex::NONE) return false;
-        _index.reserve(_buffers.size() + 1);
-        _buffers.push_back(buffer);
-        _index.insert(buffer, static_cast<std::uint32_t>(_buffers.size() - 1));
+        if (_array.size() == _array.capacity()) _array.reserve(2 * _array.size() + 8);
+        const std::size_t nbBefore = _numbers.getNbIn();
+        const std::uint32_t number = _numbers.insert(buffer);
+        if (_numbers.getNbIn() == nbBefore) return false;
+        _numbers[number] = static_cast<std::uint32_t>(_array.size());
+        _array.push_back(number);
         return true;
     }
 
     bool remove(MbBufferImp* buffer) noexcept {
-        const std::uint32_t number = _index.remove(buffer);
-        if (number == MbBufferIndex::NONE) return false;
-        MbBufferImp* const last = _buffers.back();
-        _buffers.pop_back();
-        if (last == buffer) return true;
-        _buffers[number] = last;
-        _index.setNumber(last, number);
+        const std::uint32_t number = _numbers.find(buffer);
+        if (number == Numbers::NONE) return false;
+        const std::uint32_t place = _numbers[number];
+        const std::uint32_t last = _array.back();
+        _array[place] = last;
+        _numbers[last] = place;
+        _array.pop_back();
+        _numbers.remove(number);
         return true;
     }
 
     MbBufferImp* draw() noexcept {
-        if (_buffers.empty()) return nullptr;
+        if (_array.empty()) return nullptr;
         constexpr double SCALE = 2147483647.0;
-        const auto number = static_cast<std::int64_t>(_random.next() * SCALE);
-        return _buffers[static_cast<std::size_t>(number) % _buffers.size()];
+        const auto drawn = static_cast<std::int64_t>(_random.next() * SCALE);
+        return _numbers.getBuffer(_array[static_cast<std::size_t>(drawn) % _array.size()]);
     }
 
-    bool isEmpty() const noexcept { return _buffers.empty(); }
+    bool isEmpty() const noexcept { return _array.empty(); }
 
-    void dump(std::ostream& stream) const {
+    void dump(std::ostream& stream) {
         stream << "Random buffer container:";
-        for (const MbBufferImp* const buffer : _buffers) stream << ' ' << keyOf(buffer);
+        for (const std::uint32_t number : _array) stream << ' ' << keyOf(number);
         stream << "\nPair associative indexes :";
-        for (const MbBufferImp* const buffer : _buffers) {
-            stream << " (" << keyOf(buffer) << ", " << _index.find(buffer) << ')';
+        for (const std::uint32_t number : _array) {
+            stream << " (" << keyOf(number) << ", " << _numbers[number] << ')';
         }
         stream << '\n';
     }
 
 private:
-    static const void* keyOf(const MbBufferImp* buffer) { return buffer; }
+    using Numbers = MbBufferNumbers<std::uint32_t>;
 
-    DaBookVector<MbBufferImp*> _buffers;
-    MbBufferIndex _index;
+    Numbers _numbers;
+    DaBookVector<std::uint32_t> _array;
     RnNumRecUniformRng<double> _random;
+
+    const void* keyOf(std::uint32_t number) const { return _numbers.getBuffer(number); }
 };
 
 MbUnloadRandom::MbUnloadRandom(int nbBuffers)
