@@ -532,7 +532,8 @@ TYPED_TEST(MbGuards, holdTheLockUntilTheLastCopyGoes) {
         TypeParam moved(std::move(first));
         EXPECT_TRUE(first.isNull());
         copy = moved;
-        copy = copy;
+        const TypeParam& same = copy;
+        copy = same;
         moved.unlock();
         EXPECT_TRUE(moved.isNull());
         EXPECT_TRUE(buffer.getImp().isLocked());

@@ -61,14 +61,14 @@ void MbBufferImp::decReferenceCount() {
 
 // --------------------------------------------------------------------------------------- events
 
+inline void MbBufferImp::deliver(MbEvent event) {
+    while (!_state.load(std::memory_order_relaxed)->receive(*this, event)) waitForChange();
+}
+
 void MbBufferImp::receive(MbEvent event) {
     Guard guard(_mutex);
     _guard = &guard;
     deliver(event);
-}
-
-void MbBufferImp::deliver(MbEvent event) {
-    while (!_state.load(std::memory_order_relaxed)->receive(*this, event)) waitForChange();
 }
 
 void MbBufferImp::asyncOpReported(const MbAsyncHandle& handle, MbEvent event) {
@@ -97,6 +97,21 @@ void MbBufferImp::waitForChange() {
 
 // ---------------------------------------------------------------------------------- transitions
 
+inline void MbBufferImp::setState(const MbState& state) noexcept {
+    _state.store(&state, std::memory_order_release);
+    if (LgLog::isTimelineOn()) [[unlikely]]
+        showInTimeline(state);
+}
+
+inline void MbBufferImp::follow(MbStateId next) {
+    while (next != MbStateId::NONE) {
+        _state.load(std::memory_order_relaxed)->exit(*this);
+        const MbState& state = _machine.getState(next);
+        setState(state);
+        next = state.enter(*this);
+    }
+}
+
 void MbBufferImp::transition(MbStateId next) {
     const MbState& before = *_state.load(std::memory_order_relaxed);
     std::exception_ptr failure;
@@ -111,18 +126,7 @@ void MbBufferImp::transition(MbStateId next) {
     if (failure) std::rethrow_exception(failure);
 }
 
-void MbBufferImp::follow(MbStateId next) {
-    while (next != MbStateId::NONE) {
-        _state.load(std::memory_order_relaxed)->exit(*this);
-        const MbState& state = _machine.getState(next);
-        setState(state);
-        next = state.enter(*this);
-    }
-}
-
-void MbBufferImp::setState(const MbState& state) noexcept {
-    _state.store(&state, std::memory_order_release);
-    if (!LgLog::isTimelineOn()) return;
+void MbBufferImp::showInTimeline(const MbState& state) const noexcept {
     try {
         LgLog::instant("buffer", std::string(getName()) + ": " + state.getName());
     } catch (const std::bad_alloc&) {

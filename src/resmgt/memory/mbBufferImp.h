@@ -133,6 +133,7 @@ private:
     void transition(MbStateId next);
     void follow(MbStateId next);
     void setState(const MbState& state) noexcept;
+    void showInTimeline(const MbState& state) const noexcept;
     void restore(const MbState& before) noexcept;
     void deliverPending(std::exception_ptr& failure) noexcept;
 

@@ -56,10 +56,11 @@ void MbStateImp::refuse(const MbBufferImp& buffer, MbEvent event) const {
 }
 
 void MbStateImp::go(MbBufferImp& buffer, MbEvent event, MbStateId next) const {
-    if (event == MbEvent::ASYNC_OP_SUCCEEDED || event == MbEvent::ASYNC_OP_FAILED) {
+    if (event >= MbEvent::ASYNC_OP_SUCCEEDED) {
         endOperation(buffer, MbTransitionTable::getRow(next).name);
     }
-    const bool isHit = isLoaded() && (event == MbEvent::RDLOCK || event == MbEvent::WRLOCK);
+    const bool isLock = event == MbEvent::RDLOCK || event == MbEvent::WRLOCK;
+    const bool isHit = isLock && isLoaded();
     if (isHit) buffer._lockCount = 1;  // back in this state it is set to 0 again
     buffer.transition(next);
     if (isHit) raise(buffer._nbHits);

@@ -11,20 +11,15 @@ namespace Orv {
 /// A ring through the records: what was used last stands before the head, which is no buffer's.
 class MbUnloadLRU::Books {
 public:
-    explicit Books(std::size_t nbBuffers) {
-        _numbers.reserve(nbBuffers + 1);
-        const std::uint32_t head = _numbers.insert(nullptr);
-        _numbers[head] = {head, head};
-    }
+    explicit Books(std::size_t nbBuffers) : _numbers(nbBuffers) {}
 
     bool append(MbBufferImp* buffer) {
-        const std::size_t nbBefore = _numbers.getNbIn();
         const std::uint32_t number = _numbers.insert(buffer);
-        if (_numbers.getNbIn() == nbBefore) return false;
-        const std::uint32_t last = _numbers[HEAD].previous;
+        if (number == Numbers::NONE) return false;
+        const std::uint32_t last = _numbers[HEAD].place;
         _numbers[number] = {last, HEAD};
         _numbers[last].next = number;
-        _numbers[HEAD].previous = number;
+        _numbers[HEAD].place = number;
         return true;
     }
 
@@ -32,23 +27,23 @@ public:
         const std::uint32_t number = _numbers.find(buffer);
         if (number == Numbers::NONE) return false;
         const Links links = _numbers[number];
-        _numbers[links.previous].next = links.next;
-        _numbers[links.next].previous = links.previous;
+        _numbers[links.place].next = links.next;
+        _numbers[links.next].place = links.place;
         _numbers.remove(number);
         return true;
     }
 
     MbBufferImp* getFirst() noexcept { return _numbers.getBuffer(_numbers[HEAD].next); }
-    std::size_t getNbBuffers() const noexcept { return _numbers.getNbIn() - 1; }
+    std::size_t getNbBuffers() const noexcept { return _numbers.getNbIn(); }
 
 private:
+    static constexpr std::uint32_t HEAD = 0;
     struct Links {
-        std::uint32_t previous = 0;
-        std::uint32_t next = 0;
+        std::uint32_t place = HEAD;  // behind the buffer of this number
+        std::uint32_t next = HEAD;
     };
     using Numbers = MbBufferNumbers<Links>;
 
-    static constexpr std::uint32_t HEAD = 0;
     Numbers _numbers;
 };
 

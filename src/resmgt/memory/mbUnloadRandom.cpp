@@ -12,17 +12,13 @@ namespace Orv {
 /// The buffers' numbers in an array without gaps, and where in it each of them stands.
 class MbUnloadRandom::Books {
 public:
-    explicit Books(std::size_t nbBuffers) {
-        _numbers.reserve(nbBuffers);
-        _array.reserve(nbBuffers);
-    }
+    explicit Books(std::size_t nbBuffers) : _numbers(nbBuffers) { _array.reserve(nbBuffers); }
 
     bool append(MbBufferImp* buffer) {
         if (_array.size() == _array.capacity()) _array.reserve(2 * _array.size() + 8);
-        const std::size_t nbBefore = _numbers.getNbIn();
         const std::uint32_t number = _numbers.insert(buffer);
-        if (_numbers.getNbIn() == nbBefore) return false;
-        _numbers[number] = static_cast<std::uint32_t>(_array.size());
+        if (number == Numbers::NONE) return false;
+        _numbers[number].place = static_cast<std::uint32_t>(_array.size());
         _array.push_back(number);
         return true;
     }
@@ -30,10 +26,10 @@ public:
     bool remove(MbBufferImp* buffer) noexcept {
         const std::uint32_t number = _numbers.find(buffer);
         if (number == Numbers::NONE) return false;
-        const std::uint32_t place = _numbers[number];
+        const std::uint32_t place = _numbers[number].place;
         const std::uint32_t last = _array.back();
         _array[place] = last;
-        _numbers[last] = place;
+        _numbers[last].place = place;
         _array.pop_back();
         _numbers.remove(number);
         return true;
@@ -53,13 +49,16 @@ public:
         for (const std::uint32_t number : _array) stream << ' ' << keyOf(number);
         stream << "\nPair associative indexes :";
         for (const std::uint32_t number : _array) {
-            stream << " (" << keyOf(number) << ", " << _numbers[number] << ')';
+            stream << " (" << keyOf(number) << ", " << _numbers[number].place << ')';
         }
         stream << '\n';
     }
 
 private:
-    using Numbers = MbBufferNumbers<std::uint32_t>;
+    struct Data {
+        std::uint32_t place = 0;  // in the array
+    };
+    using Numbers = MbBufferNumbers<Data>;
 
     Numbers _numbers;
     DaBookVector<std::uint32_t> _array;
