@@ -56,8 +56,9 @@ void lockLoaded(benchmark::State& state) {
 }
 BENCHMARK(lockLoaded)->Name("read lock+unlock/MbBuffer");
 
-/// One pool, and a buffer of it for each thread. The time is that of one operation, all threads
-/// together: with two it is half of that with one if they do not get into each other's way.
+/// One pool, and a buffer of it for each thread. Google Benchmark divides the time by the threads:
+/// with two it is half of that with one if they do not get into each other's way, and the machine
+/// has two processors to spare. Whether it has shows a mutex for each thread, which shares nothing.
 void lockOnThreads(benchmark::State& state) {
     static const std::vector<MbBuffer> buffers = [] {
         const MbBufferSimpleFactory factory(newHeap(4, new MbUnloadLRU(4)),
@@ -71,9 +72,12 @@ void lockOnThreads(benchmark::State& state) {
         const MbBufferRdGuardImp guard(buffer);
         benchmark::DoNotOptimize(guard.getMemory());
     }
-    state.counters["perSecond"] =
-        benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
 }
+
+BENCHMARK(sixMutexes)->Name("one each/6 times LkMutex")->Threads(1)->UseRealTime();
+BENCHMARK(sixMutexes)->Name("one each/6 times LkMutex")->Threads(2)->UseRealTime();
+BENCHMARK(lockOnThreads)->Name("one each/MbBuffer")->Threads(1)->UseRealTime();
+BENCHMARK(lockOnThreads)->Name("one each/MbBuffer")->Threads(2)->UseRealTime();
 
 // ------------------------------------------------------------------------- with an unload
 
@@ -140,8 +144,5 @@ void textbook(benchmark::State& state) {
 BENCHMARK(lockWithUnload<MbUnloadLRU>)->Name("lock with unload/MbUnloadLRU");
 BENCHMARK(lockWithUnload<MbUnloadRandom>)->Name("lock with unload/MbUnloadRandom");
 BENCHMARK(textbook)->Name("lock with unload/list and map");
-
-BENCHMARK(lockOnThreads)->Name("own buffer/MbBuffer")->Threads(1)->UseRealTime();
-BENCHMARK(lockOnThreads)->Name("own buffer/MbBuffer")->Threads(2)->UseRealTime();
 
 }  // namespace

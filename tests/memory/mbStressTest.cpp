@@ -1,6 +1,6 @@
-// Sixteen threads and more buffers than fit, for a few seconds, or for ORV_TEST_STRESS seconds: what
-// is in the buffers is what was written last, whatever was unloaded, prefetched, synced, freed,
-// destroyed or refused meanwhile.
+// Sixteen threads and more buffers than fit, for a few seconds, or for ORV_TEST_STRESS seconds:
+// what is in the buffers is what was written last, whatever was unloaded, prefetched, synced,
+// freed, destroyed or refused meanwhile.
 #include <algorithm>
 #include <array>
 #include <atomic>

@@ -222,19 +222,23 @@ private:
         for (const Step& step : ways.at(state)) step();
     }
 
+    bool isInOperation() const { return _bench.state().rfind("WaitAsync", 0) == 0; }
+
     /// Lets everything come to its end.
     void settle() {
         _mayGoOn.open();
         if (_operator.joinable()) _operator.join();
         EXPECT_TRUE(eventually("all is over", [this] {
             if (buffer.isLocked()) buffer.unlock();
-            if (_bench.state().rfind("WaitAsync", 0) == 0) buffer.asyncOpSucceeded();
+            if (isInOperation()) buffer.asyncOpSucceeded();
             const bool isWaiting = _waiter.joinable() && !_waiterIsDone.isOpen();
-            return !isWaiting && !buffer.isLocked();
+            return !isWaiting && !buffer.isLocked() && !isInOperation();
         }));
         if (_waiter.joinable()) _waiter.join();
         EXPECT_EQ(buffer.getNbWaiting(), 0u);
         _bench.manager->hook = nullptr;
+        _bench.buffer.reset();
+        EXPECT_EQ(_bench.manager->getStatistics().nbBuffers, 0u);
     }
 };
 

@@ -5,10 +5,12 @@
 
 namespace Orv {
 
-/// A pool that cuts the memory of its buffers out of one large block: buffers of mixed sizes, memory
-/// that a device or another process sees, huge pages, a footprint that is fixed from the start.
+/// A pool that cuts the memory of its buffers out of one large block: buffers of mixed sizes,
+/// memory that a device or another process sees, huge pages, a footprint that is fixed from the
+/// start.
 ///
-/// What is free lies in pieces between buffers, so more is unloaded than the sizes alone would need.
+/// What is free lies in pieces between buffers, so more is unloaded than the sizes alone would
+/// need.
 class ORV_RESMGT_API MbArenaManager : public MbPoolManager {
 public:
     /// @param arenaPool  not null.

@@ -8,12 +8,12 @@
 
 namespace Orv {
 
-/// Handle to a block of data whose memory can be taken away while nobody uses it and is brought back
-/// when it is wanted; a null one refers to none. Copies share the buffer; when the last goes, the
-/// buffer goes, without being saved.
+/// Handle to a block of data whose memory can be taken away while nobody uses it and is brought
+/// back when it is wanted; a null one refers to none. Copies share the buffer; when the last goes,
+/// the buffer goes, without being saved.
 ///
-/// The contents are used through guards, MbBufferRdGuardImp and MbBufferWrGuardImp. Factories create
-/// buffers, an MbManager has their memory, an MbProtocol knows their contents.
+/// The contents are used through guards, MbBufferRdGuardImp and MbBufferWrGuardImp. Factories
+/// create buffers, an MbManager has their memory, an MbProtocol knows their contents.
 ///
 /// - Threads: one handle by one thread at a time; the buffer itself by any number.
 /// - Errors: RCEx::ExNullPtr for a null handle; what the protocol and the manager throw, the buffer

@@ -35,8 +35,8 @@ enum class MbInitialState { FREED, UNLOADED };
 /// it changes the state, waits for another one, or is refused. docs/memory.md has the picture.
 ///
 /// - Threads: every member by any thread that holds the buffer through a counted pointer. Calls of
-///   the protocol and waits for room run with the mutex released and their thread recorded: if that
-///   thread has to wait for this buffer, it gets the assertion "! _transientStateOwner.isCurrentThread()".
+///   the protocol and waits for room run with the mutex released and their thread recorded: that
+///   thread may not wait for this buffer ("! _transientStateOwner.isCurrentThread()").
 /// - Memory: starts at a cache line, so that threads with different buffers do not meet.
 /// - Ownership: counted; the last holder to go destroys it. An asynchronous operation holds it too.
 /// - Errors: each event throws MbEx::ExIllegalTransition where the state refuses it, and what the
@@ -137,7 +137,7 @@ private:
     void restore(const MbState& before) noexcept;
     void deliverPending(std::exception_ptr& failure) noexcept;
 
-    // Counting, for the pointers
+    // Counting, for the pointers. A buffer whose last holder goes while it is locked stays.
     void incReferenceCount() const noexcept {
         _nbReferences.fetch_add(1, std::memory_order_relaxed);
     }

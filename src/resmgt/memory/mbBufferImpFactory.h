@@ -23,7 +23,8 @@ public:
     void setAlignment(const MbAlignment& alignment) noexcept { _alignment = alignment; }
     void setInitialState(MbInitialState state) noexcept { _initialState = state; }
 
-    /// Whether they trace every event; as it stands, if "memoryBuffers" is on when they are created.
+    /// Whether they trace every event; as it stands, if "memoryBuffers" is on when they are
+    /// created.
     void setTraced(bool isTraced) noexcept;
 
     /// @param name      shown by messages and dumps; need not be unique.

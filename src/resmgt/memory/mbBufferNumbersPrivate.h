@@ -16,8 +16,8 @@ class MbBufferImp;
 ///
 /// A buffer that leaves keeps its record for when it comes back, as buffers that are used do at
 /// once. Records are taken from it when others want them and half of all are kept in vain. So
-/// memory is needed only while the number of buffers grows. Record 0 is no buffer's and free for the
-/// user.
+/// memory is needed only while the number of buffers grows. Record 0 is no buffer's and free for
+/// the user.
 ///
 /// @tparam Data  16 bytes with the buffer, if it is to be fast; has a member `place`, of 32 bits,
 ///               which is below OUT exactly while the buffer is in: the user sets it.

@@ -7,7 +7,8 @@
 
 namespace Orv {
 
-/// Holds a buffer for writing, with its contents in memory, for a scope; a guard of a null handle does nothing.
+/// Holds a buffer for writing, with its contents in memory, for a scope; a guard of a null handle
+/// does nothing.
 ///
 ///     const MbBufferWrGuardImp guard(buffer);
 ///     render(guard.getMemory(), buffer.getSize());
@@ -17,8 +18,9 @@ namespace Orv {
 ///
 /// - Threads: one guard by one thread at a time. A thread that writes a buffer does not lock it
 ///   again, except by a copy: it would wait for itself.
-/// - Errors: what loading the contents throws, with nothing locked. What the protocol throws when the
-///   buffer is unlocked, unlock() throws and the destructor traces; the buffer is unlocked either way.
+/// - Errors: what loading the contents throws, with nothing locked. What the protocol throws when
+///   the buffer is unlocked, unlock() throws and the destructor traces; the buffer is unlocked
+///   either way.
 class ORV_RESMGT_API MbBufferWrGuardImp {
 public:
     MbBufferWrGuardImp() noexcept = default;  ///< Null.

@@ -5,8 +5,8 @@
 namespace Orv {
 
 /// A range of each of two buffers that belong together, such as the last part of one block of a
-/// recording and the first of the next; both may be ranges of one buffer. MbDualBufferFactory creates
-/// it.
+/// recording and the first of the next; both may be ranges of one buffer. MbDualBufferFactory
+/// creates it.
 ///
 /// Lock both at once with MbDualBufferRdGuard or MbDualBufferWrGuard, which take any two buffers in
 /// one order, so that no two of them wait for each other.

@@ -6,8 +6,8 @@
 
 namespace Orv {
 
-/// A pool that takes each buffer's memory from the heap, up to a limit. Take it where buffers are of
-/// similar size or live long; MbArenaManager cuts one block into pieces instead.
+/// A pool that takes each buffer's memory from the heap, up to a limit. Take it where buffers are
+/// of similar size or live long; MbArenaManager cuts one block into pieces instead.
 class ORV_RESMGT_API MbHeapManager : public MbPoolManager {
 public:
     /// @param maxBytes  of all loaded buffers, with what their alignments may need on top.

@@ -28,7 +28,8 @@ public:
 
     /// Gives a buffer its memory, MbBufferImp::setRegion(); waits until there is some. The buffer's
     /// mutex is not held.
-    /// @throws MbEx::ExNotEnoughMemory if there can never be enough, what unloading a buffer throws.
+    /// @throws MbEx::ExNotEnoughMemory if there can never be enough, what unloading a buffer
+    /// throws.
     virtual void allocateRegion(MbBufferImp* buffer) = 0;
 
     /// Takes a buffer's memory back and clears its region. Does not throw.

@@ -92,7 +92,8 @@ void MbPoolManager::evict(MbBufferImp& victim, Guard& guard) {
 
 void MbPoolManager::waitForRoom(Guard& guard) {
     if (_nbRegions == 0) {  // nothing is handed out, so nothing can come back
-        throw MbEx::ExNotEnoughMemory(ORV_FILE, __LINE__, "Buffer does not fit into empty pool.");
+        throw MbEx::ExNotEnoughMemory(ORV_FILE, __LINE__,
+                                      "Buffer does not fit into the empty pool");
     }
     const Counted waiting(_nbWaiting);
     _pulse.wait(guard);

@@ -13,8 +13,8 @@ namespace Orv {
 class MbState;
 enum class MbStateId : std::uint8_t;
 
-/// The states that all buffers of the process share, in two sets: one whose states trace every event
-/// that they receive, on the trace level "memoryBuffers", and one whose states do not.
+/// The states that all buffers of the process share, in two sets: one whose states trace every
+/// event that they receive, on the trace level "memoryBuffers", and one whose states do not.
 ///
 /// - Threads: any; nothing changes after a set was made.
 class ORV_RESMGT_API MbStateMachine {

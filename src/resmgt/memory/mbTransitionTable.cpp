@@ -24,8 +24,8 @@ using enum MbStateId;
 
 // clang-format off
 // A thread is at the protocol: who wants the contents waits.
-//       rdlock           wrlock           wrdup  prefetch            asyncSync          sync
-//       unlock               unload         free           destroy         asyncOpSucceeded      asyncOpFailed
+//       rdlock           wrlock           wrdup  prefetch            asyncSync          sync unlock
+//       unload         free           destroy         asyncOpSucceeded      asyncOpFailed
 constexpr MbCells BUSY = {
          wait,            wait,            ILL,   ign,                pend,              wait,
          ILL,                 ign,           pend,          ILL,            ILL,                  ILL};
@@ -36,8 +36,8 @@ constexpr MbCells STARTING = {
 
 // Each row: the state, where its own action leads, and what it does about each event.
 constexpr MbStateRow TABLE[NB_MB_STATES] = {
-    //   rdlock           wrlock           wrdup  prefetch            asyncSync          sync
-    //   unlock               unload         free           destroy         asyncOpSucceeded      asyncOpFailed
+    //   rdlock           wrlock           wrdup  prefetch            asyncSync          sync unlock
+    //   unload         free           destroy         asyncOpSucceeded      asyncOpFailed
     {ROW(Freed), NONE,
         {BeingRdLoaded,   BeingWrLoaded,   ILL,   BeingAsyncLoaded,   ign,               ign,
          ILL,                 ign,           ign,           Destroyed,      ILL,                  ILL}},

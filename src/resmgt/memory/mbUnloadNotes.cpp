@@ -9,9 +9,9 @@ namespace Orv {
 
 namespace {
 
-/// Orders what threads do, without memory that they would share: the processor's time-stamp counter,
-/// which all its cores have in common. Where that is not so, the order is only nearly right, and
-/// nothing but the choice of a victim depends on it.
+/// Orders what threads do, without memory that they would share: the processor's time-stamp
+/// counter, which all its cores have in common. Where that is not so, the order is only nearly
+/// right, and nothing but the choice of a victim depends on it.
 std::uint64_t now() noexcept {
     return __builtin_ia32_rdtsc() | 1;  // never 0
 }

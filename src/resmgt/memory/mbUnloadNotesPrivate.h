@@ -18,8 +18,8 @@ class MbUnloadStrategy;
 /// no lock of the pool: it stamps the buffer, and puts it on a list unless it is there already. The
 /// list is applied to the strategy, in the order of the stamps, when the strategy is to be used.
 ///
-/// - Threads: the first two by the thread that holds the buffer's mutex; what is applied and withdrawn,
-///   under the pool's.
+/// - Threads: the first two by the thread that holds the buffer's mutex; what is applied and
+///   withdrawn, under the pool's.
 class MbUnloadNotes {
 public:
     MbUnloadNotes() = default;

@@ -9,8 +9,8 @@ namespace Orv {
 /// Lets any buffer give way, each with the same chance: where buffers are used in turn, round and
 /// round, so that the one used longest ago is the one needed next.
 ///
-/// - Cost: every operation takes constant time; about 30 bytes per buffer, from the heap, only while
-///   the number of buffers grows.
+/// - Cost: every operation takes constant time; about 50 bytes per buffer, from the heap, only
+///   while the number of buffers grows.
 class ORV_RESMGT_API MbUnloadRandom : public MbUnloadStrategy {
 public:
     /// @param nbBuffers  room is made for so many; more may come.

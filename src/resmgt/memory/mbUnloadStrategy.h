@@ -10,9 +10,9 @@ class MbBufferImp;
 
 /// Which buffer gives way when a pool needs room: MbUnloadLRU, MbUnloadRandom or your own.
 ///
-/// A strategy knows the buffers that are loaded and unlocked. Its pool tells it what has changed, in
-/// the order in which it happened, when it is about to ask it: a buffer that was used meanwhile is
-/// removed and inserted again.
+/// A strategy knows the buffers that are loaded and unlocked. Its pool tells it what has changed,
+/// in the order in which it happened, when it is about to ask it: a buffer that was used meanwhile
+/// is removed and inserted again.
 ///
 /// - Threads: none of its own; the pool's lock is held. So it must not use what the buffers can do:
 ///   to a strategy they are keys.
