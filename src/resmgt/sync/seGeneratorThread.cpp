@@ -10,6 +10,7 @@
 #include "mtPriorityMgr.h"
 #include "mtThreadFactory.h"
 #include "seBorrowedProtocolPrivate.h"
+#include "seClientAwaitingPrivate.h"
 #include "seEx.h"
 #include "seGeneratorThreadPrivate.h"
 #include "trace.h"
@@ -151,24 +152,24 @@ SeGeneratorThread::Clients::iterator SeGeneratorThread::findNoLock(const SeClien
                         [&](const Client& other) { return other.client.get() == client; });
 }
 
-bool SeGeneratorThread::has(const SeClientThread* client) const {
+bool SeGeneratorThread::has(const SeClientThread* client) {
     const LkGuard guard(_lock);
-    return std::any_of(_clients.begin(), _clients.end(), [&](const Client& other) {
-        return other.client.get() == client && !other.isClaimed;
-    });
+    const auto found = findNoLock(client);
+    return found != _clients.end() && !found->isClaimed;
 }
 
-SeGeneratorThread::Client& SeGeneratorThread::claim(const SeClientThread& client) {
+SeGeneratorThread::Client* SeGeneratorThread::claim(const SeClientThread* client) {
     const LkGuard guard(_lock);
-    Client& claimed = *findNoLock(&client);
-    claimed.isClaimed = true;
-    claimed.client->_isStopRequested = true;
-    _pulse.pulse();
-    return claimed;
+    const auto found = findNoLock(client);
+    if (found == _clients.end() || found->isClaimed) return nullptr;
+    found->isClaimed = true;
+    return &*found;
 }
 
 ObjPtrRet<SeClientThread> SeGeneratorThread::remove(Client& claimed) {
     try {
+        const SeClientAwaiting awaiting(*claimed.client);
+        claimed.client->requestStop();
         claimed.thread->join();
     } catch (...) {
         const LkGuard guard(_lock);

@@ -53,9 +53,15 @@ public:
     /// @throws SeEx::ExSourceFailed; what starting the thread throws.
     void attach(ObjPtr<SeClientThread>& client, ObjPtr<MtThread>& thread, int divider);
 
-    bool has(const SeClientThread* client) const;       ///< And nobody takes it away already.
-    Client& claim(const SeClientThread& client);        ///< One that it has; asks it to stop.
-    ObjPtrRet<SeClientThread> remove(Client& claimed);  ///< Or throws what the client threw.
+    bool has(const SeClientThread* client);  ///< And nobody takes it away already.
+
+    /// For the caller to take it away.
+    /// @return null if it has not got it.
+    Client* claim(const SeClientThread* client);
+
+    /// Asks the claimed client to stop and waits for its end. Asserts "!isAwaited".
+    /// @throws that, or what the client threw; it is not claimed any more then.
+    ObjPtrRet<SeClientThread> remove(Client& claimed);
 
     // Source
 

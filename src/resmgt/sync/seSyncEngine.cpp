@@ -8,7 +8,6 @@
 #include "assertions.h"
 #include "mtThreadFactory.h"
 #include "seBorrowedProtocolPrivate.h"
-#include "seClientAwaitingPrivate.h"
 #include "seGeneratorThreadPrivate.h"
 
 namespace Orv {
@@ -62,11 +61,11 @@ ObjPtrRet<SeClientThread> SeSyncEngine::removeClient(SeClientThread* client) {
         foundOverall = true;
         owner = generator;
     }
+    SeGeneratorThread::Client* const claimed = foundOverall ? owner->claim(client) : nullptr;
+    foundOverall = claimed != nullptr;  // stop() may have been faster
     ORV_ASSERT(foundOverall);
-    const SeClientAwaiting awaiting(*client);
-    SeGeneratorThread::Client& claimed = owner->claim(*client);
     guard.unlock();
-    return owner->remove(claimed);
+    return owner->remove(*claimed);
 }
 
 // Generators
