@@ -218,8 +218,9 @@ bool SeGeneratorThread::waitTickDone(std::uint32_t tick, const LkTimeLimit& limi
 
 bool SeGeneratorThread::isDoneNoLock(std::uint32_t tick) const {
     if (_sourceState != RUNNING || static_cast<std::int32_t>(_count - tick) < 0) return false;
-    return std::all_of(_clients.begin(), _clients.end(),
-                       [&](const Client& client) { return client.client->hasDoneNoLock(_count); });
+    return std::all_of(_clients.begin(), _clients.end(), [now = _count](const Client& client) {
+        return client.client->hasDoneNoLock(now);
+    });
 }
 
 /// @return false if the time ran out.
