@@ -176,11 +176,11 @@ void registerCase(const Case& run) {
 const bool isRegistered = [] {
     using namespace std::chrono_literals;
     for (const bool isBusy : {false, true}) {
-        const std::string busy = isBusy ? ", processors busy" : "";
-        registerCase({"beat 1 ms, 1 client" + busy, 1ms, 1, 1000, isBusy});
-        registerCase({"beat 1 ms, 100 clients" + busy, 1ms, 100, 500, isBusy});
-        registerCase({"beat 60 per s, 1 client" + busy, 16'666'667ns, 1, 100, isBusy});
-        registerCase({"beat 60 per s, 100 clients" + busy, 16'666'667ns, 100, 60, isBusy});
+        const std::string busy = isBusy ? " processors busy" : "";
+        registerCase({"beat 1 ms 1 client" + busy, 1ms, 1, 1000, isBusy});
+        registerCase({"beat 1 ms 100 clients" + busy, 1ms, 100, 500, isBusy});
+        registerCase({"beat 60 per s 1 client" + busy, 16'666'667ns, 1, 100, isBusy});
+        registerCase({"beat 60 per s 100 clients" + busy, 16'666'667ns, 100, 60, isBusy});
     }
     return true;
 }();

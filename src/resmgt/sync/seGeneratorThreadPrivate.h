@@ -49,7 +49,7 @@ public:
     void checkNew(const SeClientThread& client);
 
     /// Takes both pointers over, or throws and leaves them alone. Asserts "_sourceState != STOPPING
-    /// && _sourceState != STOPPED" and "clientThreadIter == _clients.end()".
+    /// && _sourceState != STOPPED".
     /// @throws SeEx::ExSourceFailed; what starting the thread throws.
     void attach(ObjPtr<SeClientThread>& client, ObjPtr<MtThread>& thread, int divider);
 

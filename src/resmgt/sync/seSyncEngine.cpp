@@ -4,6 +4,7 @@
 #include <exception>
 #include <ostream>
 #include <stdexcept>
+#include <utility>
 
 #include "assertions.h"
 #include "mtThreadFactory.h"
@@ -27,6 +28,10 @@ SeSyncEngine::~SeSyncEngine() {
         stopAll(generators);
     } catch (...) {
         Assertions::traceCurrentException("destroying a sync engine");
+        // On one of its own threads it must not take away what they run on.
+        if (Generators left = copyGenerators(nullptr); !left.empty()) {
+            static_cast<void>(new Generators(std::move(left)));
+        }
     }
 }
 
