@@ -16,7 +16,8 @@ namespace Orv {
 /// - Threads: start(), waitForTick() and stop() are called by one thread, that of the source's
 ///   generator, without a lock; cancelWait() by any.
 /// - Ownership: borrowed by the engine that it was given to until SeSyncEngine::stop() has
-///   returned; by one engine at a time, else its use asserts "!_source.isInUse()".
+///   returned, so a static one is stopped before main() ends; by one engine at a time, else its
+///   use asserts "!_source.isInUse()".
 /// - Errors: what start() and waitForTick() throw stops the generator and its clients and is told
 ///   by SeSyncEngine. What the others throw is traced.
 class ORV_RESMGT_API SeSourceProtocol {

@@ -53,7 +53,8 @@ public:
     ///   client; it is still in the engine then, and the next call gives it back.
     ObjPtrRet<SeClientThread> removeClient(SeClientThread* client);
 
-    bool isSyncGenBeating(SeSourceProtocol& source);  ///< Has it ticked, and neither failed since?
+    /// Has the source ticked, and neither failed nor been stopped since?
+    bool isSyncGenBeating(SeSourceProtocol& source);
 
     /// Blocks until the source has ticked.
     /// @throws SeEx::ExSourceFailed, SeEx::ExSourceStopped.
