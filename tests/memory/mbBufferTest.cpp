@@ -273,6 +273,7 @@ std::vector<std::function<void(BufferBench&)>> lifeSteps() {
 }
 
 TEST(MbBuffer, survivesEveryNewThatFails) {
+    if (!NewShortage::isPossible()) GTEST_SKIP() << "its new belongs to the sanitizer";
     TraceManager::getInstance().setStandardErrorOn(false);  // guards trace what was refused
     static_cast<void>(TraceLevel::getMain());  // which is made when it is first asked for
     int nbRefused = 0;
@@ -308,6 +309,7 @@ TEST(MbBuffer, survivesEveryNewThatFails) {
 }
 
 TEST(MbBuffer, isNotThereWhenItsCreationFindsNoMemory) {
+    if (!NewShortage::isPossible()) GTEST_SKIP() << "its new belongs to the sanitizer";
     const RCShdPtr<ScriptedManager> manager(new ScriptedManager);
     const RCShdPtr<MbProtocol> protocol(new MbProtocol);
     const MbBufferImpFactory factory(manager);

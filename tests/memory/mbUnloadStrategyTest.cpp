@@ -35,10 +35,12 @@ TYPED_TEST(MbUnloadStrategies, knowExactlyWhatIsIn) {
         MbBufferImp* const buffer = key(random() % NB_KEYS);
         if (model.count(buffer) > 0) {
             expectAsserts("isNew", [&] { strategy.insertBuffer(buffer); });
+            strategy.touchBuffer(buffer);
             strategy.removeBuffer(buffer);
             model.erase(buffer);
         } else {
             expectAsserts("wasInserted", [&] { strategy.removeBuffer(buffer); });
+            expectAsserts("wasInserted", [&] { strategy.touchBuffer(buffer); });
             strategy.insertBuffer(buffer);
             model.insert(buffer);
         }
@@ -86,11 +88,16 @@ TEST(MbUnloadLRU, selectsInTheOrderOfInsertion) {
     for (int i = 0; i < 20'000; ++i) {
         MbBufferImp* const buffer = key(random() % 200);
         const auto found = std::find(model.begin(), model.end(), buffer);
-        if (found != model.end()) {
-            model.erase(found);
-            strategy.removeBuffer(buffer);
+        const bool wasIn = found != model.end();
+        if (wasIn) model.erase(found);
+        const unsigned choice = static_cast<unsigned>(random() % 8);
+        if (wasIn && choice < 4) {
+            model.push_back(buffer);
+            strategy.touchBuffer(buffer);
+            continue;
         }
-        if (random() % 8 != 0) {
+        if (wasIn) strategy.removeBuffer(buffer);
+        if (choice < 7) {
             model.push_back(buffer);
             strategy.insertBuffer(buffer);
         }

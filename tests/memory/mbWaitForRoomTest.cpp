@@ -1,5 +1,7 @@
 // Loaders that wait for room, and every way in which it appears.
+#include <functional>
 #include <gtest/gtest.h>
+#include <sstream>
 #include <thread>
 
 #include "eventually.h"
@@ -175,6 +177,51 @@ TEST(MbPoolManager, roomThatTheFirstLoaderCannotUseReachesTheSecond) {
     first.join();
     second.join();
     large->unlock();
+}
+
+/// A loader that runs until it waits, and is through once there is room.
+void expectWaitsUntil(MbManager& manager, const Buffer& wanted,
+                      const std::function<void()>& makeRoom) {
+    std::thread loader([&] {
+        wanted->rdlock();
+        wanted->unlock();
+    });
+    eventually("the loader waits", [&] { return manager.getStatistics().nbWaiting == 1; });
+    EXPECT_FALSE(wanted->isLoaded());
+    makeRoom();
+    loader.join();
+    EXPECT_TRUE(wanted->isLoaded());
+}
+
+TEST(MbPoolManager, waitsForAVictimThatIsBeingDestroyedInsteadOfAskingAgainAndAgain) {
+    BufferBench bench(MbInitialState::FREED, false, 64);
+    const Buffer wanted = MbBufferImpFactory(bench.manager)
+                              .create("wanted", 64, RCShdPtr<MbProtocol>(new MbProtocol));
+    bench.buffer->rdlock();
+    bench.buffer->unlock();
+    Gate isGoing, mayGo;
+    bench.manager->hook = [&](const char* call, MbBufferImp& buffer) {
+        if (&buffer == wanted.get() || std::string(call) != "bufferNotUnloadable") return;
+        isGoing.open();  // without a holder, and selected as long as this does not go on
+        mayGo.wait();
+    };
+    std::thread destroyer([&] { bench.buffer.reset(); });
+    isGoing.wait();
+    expectWaitsUntil(*bench.manager, wanted, [&] { mayGo.open(); });
+    destroyer.join();
+}
+
+TEST(MbPoolManager, waitsForAVictimWhoseLockItHasNotHeardOf) {
+    PoolBench bench(1);
+    const Buffer locked = bench.createLoaded();
+    std::ostringstream dump;
+    bench.manager->dump(dump);  // tells the strategy of it
+    // As when the flag is found set just before it is cleared.
+    locked->getPoolEntry().isNoted = true;
+    locked->rdlock();
+    locked->getPoolEntry().isNoted = false;
+    expectWaitsUntil(*bench.manager, bench.create(), [&] { locked->unlock(); });
+    EXPECT_FALSE(locked->isLoaded());
 }
 
 }  // namespace

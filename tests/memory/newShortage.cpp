@@ -6,10 +6,22 @@
 #include <malloc.h>
 #endif
 
+#if defined(__has_feature)
+#if __has_feature(thread_sanitizer)
+#define ORV_NEW_IS_TAKEN
+#endif
+#endif
+
 namespace {
 
 thread_local int nbGrantedLeft = -1;  // negative: no shortage
 thread_local bool refused = false;
+
+}  // namespace
+
+#if !defined(ORV_NEW_IS_TAKEN)
+
+namespace {
 
 void takeGrant() {
     if (nbGrantedLeft < 0) return;
@@ -65,6 +77,8 @@ void operator delete(void* memory, std::size_t, std::align_val_t alignment) noex
     operator delete(memory, alignment);
 }
 
+#endif
+
 namespace Orv {
 
 NewShortage::NewShortage(int nbGranted) noexcept {
@@ -78,6 +92,14 @@ NewShortage::~NewShortage() {
 
 bool NewShortage::hasRefused() const noexcept {
     return refused;
+}
+
+bool NewShortage::isPossible() noexcept {
+#if defined(ORV_NEW_IS_TAKEN)
+    return false;
+#else
+    return true;
+#endif
 }
 
 }  // namespace Orv

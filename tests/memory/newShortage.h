@@ -12,6 +12,9 @@ public:
     NewShortage& operator=(const NewShortage&) = delete;
 
     bool hasRefused() const noexcept;
+
+    /// False in programs whose `new` is taken already, by the thread sanitizer.
+    static bool isPossible() noexcept;
 };
 
 }  // namespace Orv

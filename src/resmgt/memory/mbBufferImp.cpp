@@ -50,8 +50,7 @@ RCShdEngPtr<MbBufferImp> MbBufferImp::tryHold() noexcept {
     return {};
 }
 
-void MbBufferImp::decReferenceCount() {
-    if (_nbReferences.fetch_sub(1, std::memory_order_acq_rel) != 1) return;
+void MbBufferImp::lastHolderGone() {
     // Nobody else can come: managers take a buffer only while it is held.
     const auto isDestroyed = [this] { return _state.load()->getId() == MbStateId::Destroyed; };
     if (!isDestroyed()) destroy();

@@ -141,7 +141,11 @@ private:
     void incReferenceCount() const noexcept {
         _nbReferences.fetch_add(1, std::memory_order_relaxed);
     }
-    void decReferenceCount();
+    void decReferenceCount() {
+        if (_nbReferences.fetch_sub(1, std::memory_order_acq_rel) == 1) [[unlikely]]
+            lastHolderGone();
+    }
+    void lastHolderGone();
     long getReferenceCount() const noexcept {
         return _nbReferences.load(std::memory_order_acquire);
     }

@@ -14,10 +14,10 @@ class MbBufferImp;
 /// What a strategy knows about the buffers that are in it: a hash table of records with fixed
 /// numbers, by which they may refer to each other.
 ///
-/// A buffer that leaves keeps its record for when it comes back, as buffers that are used do at
-/// once. Records are taken from it when others want them and half of all are kept in vain. So
-/// memory is needed only while the number of buffers grows. Record 0 is no buffer's and free for
-/// the user.
+/// A buffer that leaves keeps its record for when it comes back, as those do that are in use or
+/// unloaded for a while. Its record is taken from it when others want one and half of all are kept
+/// in vain. So memory is needed only while the number of buffers grows. Record 0 is no buffer's and
+/// free for the user.
 ///
 /// @tparam Data  16 bytes with the buffer, if it is to be fast; has a member `place`, of 32 bits,
 ///               which is below OUT exactly while the buffer is in: the user sets it.
@@ -43,11 +43,8 @@ public:
     /// Number of a buffer whose data the caller sets then; NONE if it is in already.
     /// @throws std::bad_alloc, with nothing changed.
     std::uint32_t insert(MbBufferImp* buffer) {
-        std::uint32_t number = _lastRemoved;
-        if (_records[number].buffer != buffer) {
-            number = lookUp(buffer, hashOf(buffer));
-            if (number == NONE) number = makeRecord(buffer);
-        }
+        std::uint32_t number = lookUp(buffer, hashOf(buffer));
+        if (number == NONE) number = makeRecord(buffer);
         if (isIn(_records[number])) return NONE;
         ++_nbIn;
         return number;
@@ -55,7 +52,6 @@ public:
 
     void remove(std::uint32_t number) noexcept {
         _records[number].data.place = OUT;
-        _lastRemoved = number;
         --_nbIn;
     }
 
@@ -159,7 +155,6 @@ private:
             record.data.place = UNUSED;
             _unused.push_back(number);
         }
-        _lastRemoved = 0;
         enterAll();
     }
 };

@@ -24,8 +24,9 @@ MbBufferRdGuardImp& MbBufferRdGuardImp::operator=(MbBufferRdGuardImp other) {
 }
 
 MbBufferRdGuardImp::~MbBufferRdGuardImp() {
+    if (isNull()) return;
     try {
-        unlock();
+        _buffer.getImp().unlock();
     } catch (...) {
         Assertions::traceCurrentException("unlocking a buffer");
     }

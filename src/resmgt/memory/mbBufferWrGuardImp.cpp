@@ -24,8 +24,9 @@ MbBufferWrGuardImp& MbBufferWrGuardImp::operator=(MbBufferWrGuardImp other) {
 }
 
 MbBufferWrGuardImp::~MbBufferWrGuardImp() {
+    if (isNull()) return;
     try {
-        unlock();
+        _buffer.getImp().unlock();
     } catch (...) {
         Assertions::traceCurrentException("unlocking a buffer");
     }

@@ -16,19 +16,22 @@ public:
     bool append(MbBufferImp* buffer) {
         const std::uint32_t number = _numbers.insert(buffer);
         if (number == Numbers::NONE) return false;
-        const std::uint32_t last = _numbers[HEAD].place;
-        _numbers[number] = {last, HEAD};
-        _numbers[last].next = number;
-        _numbers[HEAD].place = number;
+        link(number);
+        return true;
+    }
+
+    bool touch(MbBufferImp* buffer) noexcept {
+        const std::uint32_t number = _numbers.find(buffer);
+        if (number == Numbers::NONE) return false;
+        unlink(number);
+        link(number);
         return true;
     }
 
     bool remove(MbBufferImp* buffer) noexcept {
         const std::uint32_t number = _numbers.find(buffer);
         if (number == Numbers::NONE) return false;
-        const Links links = _numbers[number];
-        _numbers[links.place].next = links.next;
-        _numbers[links.next].place = links.place;
+        unlink(number);
         _numbers.remove(number);
         return true;
     }
@@ -45,6 +48,19 @@ private:
     using Numbers = MbBufferNumbers<Links>;
 
     Numbers _numbers;
+
+    void link(std::uint32_t number) noexcept {
+        const std::uint32_t last = _numbers[HEAD].place;
+        _numbers[number] = {last, HEAD};
+        _numbers[last].next = number;
+        _numbers[HEAD].place = number;
+    }
+
+    void unlink(std::uint32_t number) noexcept {
+        const Links links = _numbers[number];
+        _numbers[links.place].next = links.next;
+        _numbers[links.next].place = links.place;
+    }
 };
 
 MbUnloadLRU::MbUnloadLRU(int nbBuffers)
@@ -63,6 +79,11 @@ void MbUnloadLRU::insertBuffer(MbBufferImp* buffer) {
 
 void MbUnloadLRU::removeBuffer(MbBufferImp* buffer) {
     const bool wasInserted = _books->remove(buffer);
+    ORV_ASSERT(wasInserted);
+}
+
+void MbUnloadLRU::touchBuffer(MbBufferImp* buffer) {
+    const bool wasInserted = _books->touch(buffer);
     ORV_ASSERT(wasInserted);
 }
 

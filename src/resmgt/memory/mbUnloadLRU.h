@@ -21,6 +21,7 @@ public:
     const char* getName() const override;
     void insertBuffer(MbBufferImp* buffer) override;
     void removeBuffer(MbBufferImp* buffer) override;
+    void touchBuffer(MbBufferImp* buffer) override;
     MbBufferImp* selectVictim() const override;
     bool isEmpty() const override;
     void dump(std::ostream&) const override;

@@ -34,6 +34,10 @@ void MbUnloadNotes::noteNotUnloadable(MbBufferImp& buffer) noexcept {
     if (!entry.isNoted.load(std::memory_order_relaxed)) push(buffer);
 }
 
+void MbUnloadNotes::reserve(std::size_t nbBuffers) {
+    if (nbBuffers > _batch.capacity()) _batch.reserve(std::max(nbBuffers, 2 * _batch.capacity()));
+}
+
 void MbUnloadNotes::push(MbBufferImp& buffer) noexcept {
     MbPoolEntry& entry = buffer.getPoolEntry();
     if (entry.isNoted.exchange(true, std::memory_order_seq_cst)) return;
@@ -61,13 +65,8 @@ std::exception_ptr MbUnloadNotes::applyTo(MbUnloadStrategy& strategy) noexcept {
     std::sort(_batch.begin(), _batch.end(),
               [](const Note& left, const Note& right) { return left.since < right.since; });
     for (const Note& note : _batch) {
-        MbPoolEntry& entry = note.buffer->getPoolEntry();
-        if (entry.insertedSince.load(std::memory_order_relaxed) == note.since) continue;
-        withdraw(strategy, *note.buffer);
-        if (note.since == 0) continue;
         try {
-            strategy.insertBuffer(note.buffer);
-            entry.insertedSince.store(note.since, std::memory_order_relaxed);
+            tell(strategy, note);
         } catch (...) {
             failure = std::current_exception();
             push(*note.buffer);
@@ -75,6 +74,20 @@ std::exception_ptr MbUnloadNotes::applyTo(MbUnloadStrategy& strategy) noexcept {
     }
     _batch.clear();
     return failure;
+}
+
+void MbUnloadNotes::tell(MbUnloadStrategy& strategy, const Note& note) {
+    std::atomic<std::uint64_t>& insertedSince = note.buffer->getPoolEntry().insertedSince;
+    const std::uint64_t before = insertedSince.load(std::memory_order_relaxed);
+    if (before == note.since) return;
+    if (note.since == 0) return withdraw(strategy, *note.buffer);
+    insertedSince.store(0, std::memory_order_relaxed);  // what throws has left the buffer out
+    if (before != 0) {
+        strategy.touchBuffer(note.buffer);
+    } else {
+        strategy.insertBuffer(note.buffer);
+    }
+    insertedSince.store(note.since, std::memory_order_relaxed);
 }
 
 void MbUnloadNotes::withdraw(MbUnloadStrategy& strategy, MbBufferImp& buffer) noexcept {

@@ -35,7 +35,7 @@ public:
     void noteNotUnloadable(MbBufferImp& buffer) noexcept;
 
     /// Makes room for the notes of so many buffers.
-    void reserve(std::size_t nbBuffers) { _batch.reserve(nbBuffers); }
+    void reserve(std::size_t nbBuffers);
 
     /// Tells the strategy all that is noted. What it refuses by throwing stays noted.
     /// @return the latest of its exceptions, or null.
@@ -57,6 +57,7 @@ private:
     DaBookVector<Note> _batch;  // empty but in applyTo(); has room for all buffers
 
     void push(MbBufferImp& buffer) noexcept;
+    static void tell(MbUnloadStrategy& strategy, const Note& note);
     void takeAll() noexcept;
 };
 

@@ -11,8 +11,7 @@ class MbBufferImp;
 /// Which buffer gives way when a pool needs room: MbUnloadLRU, MbUnloadRandom or your own.
 ///
 /// A strategy knows the buffers that are loaded and unlocked. Its pool tells it what has changed,
-/// in the order in which it happened, when it is about to ask it: a buffer that was used meanwhile
-/// is removed and inserted again.
+/// in the order in which it happened, when it is about to ask it.
 ///
 /// - Threads: none of its own; the pool's lock is held. So it must not use what the buffers can do:
 ///   to a strategy they are keys.
@@ -39,6 +38,10 @@ public:
 
     virtual bool isEmpty() const = 0;
     virtual void dump(std::ostream&) const = 0;
+
+    /// A buffer that is in (else an assertion) was used, and is unloadable again. As it stands,
+    /// removes and inserts it.
+    virtual void touchBuffer(MbBufferImp* buffer);
 
 protected:
     MbUnloadStrategy() = default;
