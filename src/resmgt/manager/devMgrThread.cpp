@@ -33,7 +33,8 @@ public:
         try {
             run();
         } catch (...) {
-            Assertions::traceCurrentException("delivering a notification; the manager's thread ends");
+            Assertions::traceCurrentException(
+                "delivering a notification; the manager's thread ends");
             _fifo->close(true);
             return;
         }
@@ -129,9 +130,9 @@ DevMgrThread::DevMgrThread(RCShdPtr<DevMgrFifo> fifo) : _fifo(std::move(fifo)) {
     AbandonedThreads::getInstance().joinEnded();
     _thread = MtThreadFactory::getInstance().create(
         "DevMgr ANO", ObjPtr<MtThreadProtocol>(new ANOThreadProtocol(_fifo)));
-    _priorityRelation.reset(new PriorityRelation(
-        "DevMgr ANO", _thread->getPriority(), PriorityRelation::LESS,
-        const_cast<Priority&>(DevMDStdAccessPrtcl::getPriority())));
+    _priorityRelation.reset(
+        new PriorityRelation("DevMgr ANO", _thread->getPriority(), PriorityRelation::LESS,
+                             const_cast<Priority&>(DevMDStdAccessPrtcl::getPriority())));
     _thread->start();
 }
 

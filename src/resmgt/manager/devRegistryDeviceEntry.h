@@ -24,10 +24,9 @@ public:
     [[nodiscard]] static ObjPtr<DevRegistryEntry> create(const LiString& name,
                                                          const LiString& description,
                                                          Arguments... arguments) {
-        return ObjPtr<DevRegistryEntry>(
-            new DevRegistryDeviceEntry(name, description, [name, arguments...] {
-                return RCShdPtr<DevMDPrtcl>(new Device(name, arguments...));
-            }));
+        return ObjPtr<DevRegistryEntry>(new DevRegistryDeviceEntry(
+            name, description,
+            [name, arguments...] { return RCShdPtr<DevMDPrtcl>(new Device(name, arguments...)); }));
     }
 
 private:
