@@ -111,6 +111,8 @@ void DevSeqTreeNode::recover() {
 void DevSeqTreeNode::abortDevice() noexcept {
     try {
         _util->abort();
+    } catch (const DevPrtclEx::ExMDStdFifoClosed&) {
+        ORV_TRACE(traceLevel) << _name << ": the device of the failed node is gone";
     } catch (...) {
         Assertions::traceCurrentException("aborting the device of a failed sequence node");
     }
