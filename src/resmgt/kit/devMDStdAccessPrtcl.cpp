@@ -170,13 +170,12 @@ void DevMDStdAccessPrtcl::performClose() {
 }
 
 void DevMDStdAccessPrtcl::startThread() {
-    ObjPtr<MtThread> thread = MtThreadFactory::getInstance().create(
+    // In place before it runs: the thread itself asks for it. What fails here, performOpen() undoes.
+    _thread = MtThreadFactory::getInstance().create(
         _name, ObjPtr<MtThreadProtocol>(std::move(_waitingProtocol)), false, _stackSize);
-    ObjPtr<PriorityRelation> relation(new PriorityRelation(
-        "std-device", thread->getPriority(), PriorityRelation::EQUAL, StdDevicePriority::get()));
-    thread->start();
-    _priorityRelation = std::move(relation);
-    _thread = std::move(thread);
+    _priorityRelation.reset(new PriorityRelation(
+        "std-device", _thread->getPriority(), PriorityRelation::EQUAL, StdDevicePriority::get()));
+    _thread->start();
 }
 
 /// Returns when the device's thread has been through the request, or has ended.
