@@ -48,7 +48,7 @@ class Run {
 public:
     Run(const DevSeqWorld::Shape& shape, const Budget& budget, bool isEager)
         : _world(shape), _left(budget), _isEager(isEager) {
-            for (const auto& device : _world.devices) {
+        for (const auto& device : _world.devices) {
             // Of a device that has died the reports carry its own number, too.
             device->onCommand = [](DevSeqSimDevice::Kind) {};
         }
@@ -118,9 +118,8 @@ public:
             add(label.device + 4U * label.isReady + 8U * label.isLockLost + 16U * label.isOne);
         }
         key += '|';
-        for (const int left : {_left.sync, _left.stop, _left.abort, _left.recover,
-                               _left.recoverOne, _left.lockLost, _left.readyAgain, _left.drop,
-                               _left.die}) {
+        for (const int left : {_left.sync, _left.stop, _left.abort, _left.recover, _left.recoverOne,
+                               _left.lockLost, _left.readyAgain, _left.drop, _left.die}) {
             add(left);
         }
         add(_hasCalledStart + 2 * _isSyncInForce + 4 * _isStopping + 8 * _isAborting +
@@ -395,12 +394,8 @@ struct Trees {
     DevSeqWorld::Shape shape;
 };
 
-const Trees trees[] = {{"one", {-1}},
-                       {"pair", {-1, 0}},
-                       {"two", {-1, -1}},
-                       {"chain", {-1, 0, 1}},
-                       {"fork", {-1, 0, 0}},
-                       {"pairAndOne", {-1, 0, -1}}};
+const Trees trees[] = {{"one", {-1}},         {"pair", {-1, 0}},    {"two", {-1, -1}},
+                       {"chain", {-1, 0, 1}}, {"fork", {-1, 0, 0}}, {"pairAndOne", {-1, 0, -1}}};
 
 /// How much is explored: 0 under sanitizers, 1 in a run of all tests, 2 and more where there is time.
 int getWidth() {

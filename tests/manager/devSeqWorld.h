@@ -30,7 +30,7 @@ public:
     ObjPtr<DevANO> lockLostANO;
     int nbCommands[NB_KINDS] = {};
     bool hasStarted = false, isReady = false, isLocked = false, hasEnded = false;
-    bool isDead = false;                               // its thread has gone
+    bool isDead = false;                                // its thread has gone
     std::function<void(Kind)> onCommand = [](Kind) {};  // may throw
 
     bool isLatest(const Command& command) const {
@@ -39,7 +39,7 @@ public:
 
     /// Answers the command, or drops it.
     void answer(std::size_t index, bool isDone) {
-        const std::unique_ptr<Command> command = std::move(commands[index]);
+        const std::unique_ptr<Command> command = std::move(commands.at(index));
         commands.erase(commands.begin() + static_cast<std::ptrdiff_t>(index));
         if (!isDone) return;
         switch (command->kind) {
@@ -111,11 +111,11 @@ public:
         std::vector<DevSeqTree::Edge> edges;
         for (std::size_t i = 0; i < shape.size(); ++i) {
             devices.emplace_back(new DevSeqSimDevice);
-            nodes.push_back(&tree->addNode(LiString("node") + std::to_string(i).c_str(),
-                                           devices.back()));
+            nodes.push_back(
+                &tree->addNode(LiString("node") + std::to_string(i).c_str(), devices.back()));
             const int parent = shape[i];
-            edges.push_back({parent < 0 ? nullptr : nodes[static_cast<std::size_t>(parent)],
-                             nodes.back()});
+            edges.push_back(
+                {parent < 0 ? nullptr : nodes[static_cast<std::size_t>(parent)], nodes.back()});
         }
         tree->link(edges);
     }
@@ -179,9 +179,9 @@ public:
     }
 
     static const char* nameOf(DevSeqState state) {
-        static constexpr const char* names[] = {"init", "start",   "wsr",   "ready", "wml",
-                                                "sync", "lock",    "recover", "wss", "stop",
-                                                "abort", "final",  "_ill",  "_exc"};
+        static constexpr const char* names[] = {"init",  "start", "wsr",     "ready", "wml",
+                                                "sync",  "lock",  "recover", "wss",   "stop",
+                                                "abort", "final", "_ill",    "_exc"};
         return names[static_cast<int>(state)];
     }
 

@@ -1,11 +1,10 @@
-#include "devSeqMachine.h"
-
 #include <deque>
 #include <gtest/gtest.h>
 #include <map>
 #include <stdexcept>
 
 #include "devMgrEx.h"
+#include "devSeqMachine.h"
 #include "devSeqSMDescription.h"
 #include "expectThrows.h"
 

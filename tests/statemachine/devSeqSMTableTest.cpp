@@ -1,9 +1,8 @@
-#include "devSeqSMTable.h"
-
 #include <gtest/gtest.h>
 
 #include "devSeqEv.h"
 #include "devSeqSMDescription.h"
+#include "devSeqSMTable.h"
 #include "devSeqState.h"
 #include "expectThrows.h"
 
@@ -24,9 +23,9 @@ TEST(DevSeqSMTable, hasEveryPairOfTheDescription) {
         for (std::size_t e = 0; e < machine.events.size(); ++e) {
             EXPECT_EQ(get(table.getEvents(), static_cast<int>(e)), machine.events[e]);
             const auto* const pair = machine.findPair(machine.states[s], machine.events[e]);
-            const std::string transition = get(
-                table.getTransitions(),
-                table.getTransition(static_cast<int>(s), static_cast<unsigned>(e)));
+            const std::string transition =
+                get(table.getTransitions(),
+                    table.getTransition(static_cast<int>(s), static_cast<unsigned>(e)));
             std::string expected = "_ill";
             if (pair != nullptr) {
                 expected = pair->transitions.size() == 1

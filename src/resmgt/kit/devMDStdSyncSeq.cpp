@@ -60,16 +60,11 @@ DevMDSyncSeqDone DevMDSyncSeqRequest::postpone() {
     return DevMDSyncSeqDone(_request.releaseACO());
 }
 
-struct DevMDSyncSeqSignals::Signals : RCBase<LkCounter<long>> {
-    const ObjPtr<DevANO> ready;
-    const ObjPtr<DevANO> lockLost;
-
-    Signals(ObjPtr<DevANO> ready_, ObjPtr<DevANO> lockLost_)
-        : ready(std::move(ready_)), lockLost(std::move(lockLost_)) {}
-};
-
 DevMDSyncSeqSignals::DevMDSyncSeqSignals(ObjPtr<DevANO> ready, ObjPtr<DevANO> lockLost)
-    : _signals(new Signals(std::move(ready), std::move(lockLost))) {}
+    : _signals(new Signals) {
+    _signals->ready = std::move(ready);
+    _signals->lockLost = std::move(lockLost);
+}
 
 void DevMDSyncSeqSignals::ready() const {
     if (!_signals.isNull()) _signals->ready->performExecute();

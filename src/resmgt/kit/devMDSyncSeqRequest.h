@@ -54,8 +54,11 @@ public:
     void lockLost() const;  ///< Fallen out of step; the device will be told to recover.
 
 private:
-    struct Signals;
-    RCShdPtr<Signals> _signals;
+    struct Signals : RCBase<LkCounter<long>> {
+        ObjPtr<DevANO> ready;
+        ObjPtr<DevANO> lockLost;
+    };
+    RCShdPtr<Signals> _signals;  // null: of no sequence
 };
 
 }  // namespace Orv
