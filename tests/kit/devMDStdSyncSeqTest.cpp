@@ -78,11 +78,11 @@ protected:
         note("start");
         onStart(signals);
     }
-    void sync(const DtTime& time, DevMDSyncSeqRequest& request) override {
+    void syncTo(const DtTime& time, DevMDSyncSeqRequest& request) override {
         note("sync@" + std::to_string(static_cast<int>(time.getSeconds())));
         onSync(request);
     }
-    void sync(const DtTimeMark& mark, DevMDSyncSeqRequest& request) override {
+    void syncAt(const DtTimeMark& mark, DevMDSyncSeqRequest& request) override {
         note("sync#" + std::to_string(mark.getNanoseconds()));
         onSync(request);
     }

@@ -61,10 +61,10 @@ protected:
         }
         _script.onStart(std::string(getName().getText()), signals);
     }
-    void sync(const DtTime&, DevMDSyncSeqRequest& request) override {
+    void syncTo(const DtTime&, DevMDSyncSeqRequest& request) override {
         _script.perform(getName(), "sync", &request);
     }
-    void sync(const DtTimeMark&, DevMDSyncSeqRequest& request) override {
+    void syncAt(const DtTimeMark&, DevMDSyncSeqRequest& request) override {
         _script.perform(getName(), "sync", &request);
     }
     void stop(DevMDSyncSeqRequest& request) override {

@@ -94,10 +94,10 @@ public:
         return create([&device = _device](auto& request) { device.stop(request); });
     }
     ObjPtr<DevANO> createSyncANO(const DtTime& time) override {
-        return create([&device = _device, time](auto& request) { device.sync(time, request); });
+        return create([&device = _device, time](auto& request) { device.syncTo(time, request); });
     }
     ObjPtr<DevANO> createSyncANO(const DtTimeMark& mark) override {
-        return create([&device = _device, mark](auto& request) { device.sync(mark, request); });
+        return create([&device = _device, mark](auto& request) { device.syncAt(mark, request); });
     }
     ObjPtr<DevANO> createAbortANO() override {
         return create([&device = _device](auto& request) { device.abort(request); });
@@ -139,8 +139,8 @@ void DevMDStdSyncSeqDevice::start(const DevMDSyncSeqSignals& signals) {
     signals.ready();
 }
 
-void DevMDStdSyncSeqDevice::sync(const DtTime&, DevMDSyncSeqRequest&) {}
-void DevMDStdSyncSeqDevice::sync(const DtTimeMark&, DevMDSyncSeqRequest&) {}
+void DevMDStdSyncSeqDevice::syncTo(const DtTime&, DevMDSyncSeqRequest&) {}
+void DevMDStdSyncSeqDevice::syncAt(const DtTimeMark&, DevMDSyncSeqRequest&) {}
 void DevMDStdSyncSeqDevice::recover(DevMDSyncSeqRequest&) {}
 void DevMDStdSyncSeqDevice::stop(DevMDSyncSeqRequest&) {}
 void DevMDStdSyncSeqDevice::abort(DevMDSyncSeqRequest&) {}

@@ -25,9 +25,9 @@ protected:
     virtual void start(const DevMDSyncSeqSignals& signals);
 
     /// Get into step at a place on the sequence's line of time; done when it is. By default at once.
-    virtual void sync(const DtTime& time, DevMDSyncSeqRequest& request);
+    virtual void syncTo(const DtTime& time, DevMDSyncSeqRequest& request);
     /// The same at a moment of the running clock.
-    virtual void sync(const DtTimeMark& mark, DevMDSyncSeqRequest& request);
+    virtual void syncAt(const DtTimeMark& mark, DevMDSyncSeqRequest& request);
 
     virtual void recover(DevMDSyncSeqRequest& request);  ///< Get ready again.
     virtual void stop(DevMDSyncSeqRequest& request);

@@ -98,6 +98,8 @@ public:
     }
     void performExecute() override {
         _hasRun = true;
+        // That a start was taken is of interest to nobody; what counts is that the device is ready.
+        if (_kind == DevSeqReport::STARTED) return;
         if (_kind == DevSeqReport::LOCKED) _line->endSync(_attempt);
         _line->report(_kind, _attempt, true);
     }

@@ -52,7 +52,7 @@ void DevSeqTreeNode::take(const DevSeqReport& report) {
         sendToItself(DevSeqEv::ABORTED);
     } else if (report.kind == DevSeqReport::LOCK_LOST) {
         recover();
-    } else if (report.kind != DevSeqReport::STARTED) {
+    } else {
         ORV_TRACE(traceLevel) << _name << ": nobody awaits \"" << nameOf(report.kind) << "\"";
     }
 }
