@@ -1,0 +1,7 @@
+#include "devSMConditionalTransition.h"
+
+namespace Orv {
+
+DevSMConditionalTransition::~DevSMConditionalTransition() = default;
+
+}  // namespace Orv

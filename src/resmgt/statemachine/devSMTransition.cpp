@@ -1,0 +1,7 @@
+#include "devSMTransition.h"
+
+namespace Orv {
+
+DevSMTransition::~DevSMTransition() = default;
+
+}  // namespace Orv

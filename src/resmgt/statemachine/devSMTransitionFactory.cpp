@@ -1,0 +1,7 @@
+#include "devSMTransitionFactory.h"
+
+namespace Orv {
+
+DevSMTransitionFactory::~DevSMTransitionFactory() = default;
+
+}  // namespace Orv
