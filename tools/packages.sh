@@ -6,9 +6,9 @@
   PACKAGES_BUILD=(g++ cmake ninja-build ccache libgtest-dev libgmock-dev libxml2-dev)
   PACKAGES_CLANG=(clang-19 libclang-rt-19-dev llvm-19)
   PACKAGES_WINDOWS=(g++-mingw-w64-x86-64-posix googletest wine64)
-  PACKAGES_BENCH=(libbenchmark-dev pkg-config python3 libabsl-dev libboost-dev libboost-thread-dev
-    libconcurrentqueue-dev libglib2.0-dev libpoco-dev libpugixml-dev libtbb-dev libxml2-dev
-    qt6-base-dev)
+  PACKAGES_BENCH=(libbenchmark-dev pkg-config python3 libabsl-dev libace-dev libboost-dev
+    libboost-thread-dev libconcurrentqueue-dev libglib2.0-dev libpoco-dev libpugixml-dev libtbb-dev
+    libxml2-dev qt6-base-dev)
   PACKAGES_DOCS=(doxygen graphviz python3)
   PACKAGES_CHECK=(clang-format-19 clang-tidy-19 pkg-config python3 shellcheck)
 }

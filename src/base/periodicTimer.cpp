@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "assertions.h"
-#include "periodicTimerNative.h"
 
 namespace Orv {
 
@@ -19,23 +18,20 @@ double checkInterval(double intervalSeconds) {
 
 }  // namespace
 
-PeriodicTimer::PeriodicTimer(double intervalSeconds)
-    : _interval(checkInterval(intervalSeconds)), _native(std::make_unique<Native>()) {}
-
-PeriodicTimer::~PeriodicTimer() = default;
+PeriodicTimer::PeriodicTimer(double intervalSeconds) : _interval(checkInterval(intervalSeconds)) {}
 
 void PeriodicTimer::start() {
     const std::lock_guard guard(_lock);
     _base = DtTimeMark::now();
     _baseTicks = _toldTicks = _lateTicks = 0;
     _isRunning = true;
-    _native->wake();
+    _sleeper.wake();
 }
 
 void PeriodicTimer::stop() {
     const std::lock_guard guard(_lock);
     _isRunning = false;
-    _native->wake();
+    _sleeper.wake();
 }
 
 std::uint64_t PeriodicTimer::wait() {
@@ -46,7 +42,10 @@ std::uint64_t PeriodicTimer::wait() {
             _lateTicks += due - _toldTicks - 1;
             return _toldTicks = due;
         }
-        _native->waitUntil(lock, deadlineOf(_toldTicks + 1));
+        const DtTimeMark deadline = deadlineOf(_toldTicks + 1);
+        lock.unlock();
+        _sleeper.sleepUntil(deadline);
+        lock.lock();
     }
     return 0;
 }
@@ -62,7 +61,7 @@ double PeriodicTimer::setInterval(double intervalSeconds) {
         _baseTicks = due;
     }
     const double before = std::exchange(_interval, intervalSeconds);
-    _native->wake();
+    _sleeper.wake();
     return before;
 }
 

@@ -1,11 +1,11 @@
 #pragma once
 
 #include <cstdint>
-#include <memory>
 #include <mutex>
 
 #include "baseApi.h"
 #include "dtTimeMark.h"
+#include "wakeableSleeper.h"
 
 namespace Orv {
 
@@ -25,7 +25,6 @@ public:
     /// The timer stands still until start().
     /// @param intervalSeconds  finite and at least SHORTEST_SECONDS, else an assertion.
     explicit PeriodicTimer(double intervalSeconds);
-    ~PeriodicTimer();
 
     PeriodicTimer(const PeriodicTimer&) = delete;
     PeriodicTimer& operator=(const PeriodicTimer&) = delete;
@@ -46,8 +45,6 @@ public:
     std::uint64_t getNbLateTicks() const;  ///< Ticks since the start that a later one overtook.
 
 private:
-    class Native;  // PeriodicTimerPosix or PeriodicTimerWindows, see periodicTimerNative.h
-
     mutable std::mutex _lock;
     double _interval;  // seconds
     bool _isRunning = false;
@@ -55,7 +52,7 @@ private:
     std::uint64_t _baseTicks = 0;
     std::uint64_t _toldTicks = 0;
     std::uint64_t _lateTicks = 0;
-    std::unique_ptr<Native> _native;  // never null
+    WakeableSleeper _sleeper;
 
     DtTimeMark deadlineOf(std::uint64_t tick) const noexcept;
     std::uint64_t findDueTick(const DtTimeMark& now) const noexcept;

@@ -36,4 +36,9 @@ MtEx::ExNoContent::ExNoContent(const char* file, int line, const char* slot)
     setReason(std::string("Thread data \"") + slot + "\" has no content.");
 }
 
+MtEx::ExPoolStopped::ExPoolStopped(const char* file, int line, const char* pool)
+    : ExConcrete(file, line) {
+    setReason(std::string("Thread pool \"") + pool + "\" is stopped.");
+}
+
 }  // namespace Orv

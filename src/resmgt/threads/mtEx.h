@@ -17,6 +17,7 @@ public:
     class ExThrownException;
     class ExStdThrownException;
     class ExNoContent;
+    class ExPoolStopped;
 
     const char* what() const noexcept override;
 
@@ -61,6 +62,12 @@ private:
 class ORV_RESMGT_API MtEx::ExNoContent : public ExConcrete<ExNoContent, MtEx> {
 public:
     ExNoContent(const char* file, int line, const char* slot);
+};
+
+/// A pool takes no tasks: it was not started, or is being stopped.
+class ORV_RESMGT_API MtEx::ExPoolStopped : public ExConcrete<ExPoolStopped, MtEx> {
+public:
+    ExPoolStopped(const char* file, int line, const char* pool);
 };
 
 }  // namespace Orv
