@@ -1,0 +1,100 @@
+#include "devMDStdDevice.h"
+
+#include <string_view>
+
+namespace Orv {
+
+namespace {
+
+/// A request that is a function.
+class FunctionANO : public DevMDStdANO {
+public:
+    explicit FunctionANO(std::function<void()> work) : _work(std::move(work)) {}
+    void performExecute() override { _work(); }
+
+private:
+    const std::function<void()> _work;
+};
+
+ObjPtr<DevANO> createANO(std::function<void()> work) {
+    return ObjPtr<DevANO>(new FunctionANO(std::move(work)));
+}
+
+}  // namespace
+
+/// Calls the device's own functions. The device outlives its thread, and so the requests.
+class DevMDStdDevice::AccessFactory : public DevMDStdAccessANOFactory {
+public:
+    explicit AccessFactory(DevMDStdDevice& device) : _device(device) {}
+    ObjPtr<DevANO> createOpenANO() override {
+        return createANO([this] { _device.open(); });
+    }
+    ObjPtr<DevANO> createCloseANO() override {
+        return createANO([this] { _device.close(); });
+    }
+
+private:
+    DevMDStdDevice& _device;
+};
+
+DevMDStdDevice::DevMDStdDevice(const LiString& name, int capacity)
+    : DevMDStdDevice(name, RCShdPtr<DevMDStdFifo>(new DevMDStdFifo(capacity))) {}
+
+DevMDStdDevice::DevMDStdDevice(const LiString& name, const RCShdPtr<DevMDStdFifo>& fifo)
+    : DevMDStdAccessPrtcl(name, fifo,
+                          ObjPtr<DevMDStdThreadProtocol>(new DevMDStdThreadProtocol(fifo)),
+                          ObjPtr<DevMDStdAccessANOFactory>(new AccessFactory(*this))),
+      DevMDStdPropertyPrtcl(name),
+      DevMDStdStreamPrtcl(name),
+      _name(name),
+      _fifo(fifo) {}
+
+DevMDStdDevice::~DevMDStdDevice() noexcept(false) = default;
+
+void DevMDStdDevice::post(std::function<void()> work) {
+    _fifo->produce(DevANOQueueEntry(createANO(std::move(work))));
+}
+
+LiString DevMDStdDevice::getLastName(const LiString& path) {
+    return LiString(path.getText().substr(path.getText().rfind(':') + 1));
+}
+
+void DevMDStdDevice::addToSet(const LiString& path, RCShdPtr<DevMDPropertyAny> property) {
+    const ObjPtr<DevMDStdPropertySetBuilder> builder = getPropertySetBuilder();
+    std::string_view rest = path.getText();
+    for (std::size_t colon = rest.find(':'); colon != std::string_view::npos;
+         colon = rest.find(':')) {
+        builder->pushSet(LiString(rest.substr(0, colon)), LiString());
+        rest.remove_prefix(colon + 1);
+    }
+    builder->addProperty(std::move(property));
+}
+
+RCShdPtr<DevMDStdStreamPassiveSink> DevMDStdDevice::addSink(
+    const LiString& name, const LiString& description, DevMDStdFunctionSinkFactory::Take take) {
+    ObjPtr<DevMDStdStreamPassiveSinkANOFactory> factory(
+        new DevMDStdFunctionSinkFactory(std::move(take)));
+    RCShdPtr<DevMDStdStreamPassiveSink> sink(
+        new DevMDStdStreamPassiveSink(name, description, _fifo, std::move(factory)));
+    addStream(sink);
+    return sink;
+}
+
+RCShdPtr<DevMDStdStreamLoopSource> DevMDStdDevice::addLoopSource(
+    const LiString& name, const LiString& description, DevMDStdStreamLoopSource::Loop loop) {
+    RCShdPtr<DevMDStdStreamLoopSource> source(
+        new DevMDStdStreamLoopSource(name, description, std::move(loop)));
+    addStream(source);
+    return source;
+}
+
+RCShdPtr<DevMDStdStreamPassiveSource> DevMDStdDevice::addPassiveSource(const LiString& name,
+                                                                       const LiString& description,
+                                                                       int capacity) {
+    RCShdPtr<DevMDStdStreamPassiveSource> source(
+        new DevMDStdStreamPassiveSource(name, description, capacity, _fifo));
+    addStream(source);
+    return source;
+}
+
+}  // namespace Orv

@@ -1,0 +1,50 @@
+#pragma once
+
+#include "devMDStdFifo.h"
+#include "devMDStreamSink.h"
+#include "lkLock.h"
+
+namespace Orv {
+
+/// Makes the requests that hand a stream's elements to the device; supplied by the device. For a
+/// function that takes them, DevMDStdFunctionSinkFactory is ready.
+///
+/// - Threads: called by any thread; the requests run on the device's thread.
+class ORV_RESMGT_API DevMDStdStreamPassiveSinkANOFactory {
+public:
+    virtual ~DevMDStdStreamPassiveSinkANOFactory();
+    virtual ObjPtr<DevANO> createPushANO(ObjPtr<DevMDStreamElem> elem) = 0;
+};
+
+/// Passive sink of a standard device: each element becomes a request in the device's queue. The
+/// last one the device sees is terminal, STOPPED if the source gave none.
+///
+/// - Threads: any.
+/// - Errors: RCEx::ExNullPtr without a queue; DevPrtclEx::ExMDStdFifoClosed if the device is closed
+///   or dead.
+class ORV_RESMGT_API DevMDStdStreamPassiveSink : public DevMDStreamPassiveSink {
+public:
+    DevMDStdStreamPassiveSink(const LiString& name, const LiString& description,
+                              RCShdPtr<DevMDStdFifo> fifo,
+                              ObjPtr<DevMDStdStreamPassiveSinkANOFactory> factory);
+    ~DevMDStdStreamPassiveSink() noexcept(false) override;
+
+    LiString getName() override { return _name; }
+    LiString getDescription() override { return _description; }
+    bool isAvailable() override { return _isAvailable.load(); }
+    State getState() override;
+    void start() override;
+    void stop() override;
+    bool isReady() override { return _fifo->hasRoom(); }
+    void push(ObjPtr<DevMDStreamElem> elem) override;
+
+private:
+    const LiString _name;
+    const LiString _description;
+    const RCShdPtr<DevMDStdFifo> _fifo;
+    const ObjPtr<DevMDStdStreamPassiveSinkANOFactory> _factory;
+    std::atomic<bool> _isAvailable{true};
+    std::atomic<State> _state{State::FREE};
+};
+
+}  // namespace Orv

@@ -1,0 +1,73 @@
+#include "devMDStdThreadProtocol.h"
+
+#include "assertions.h"
+#include "devPrtclEx.h"
+#include "lgSpan.h"
+
+namespace Orv {
+
+DevMDStdThreadProtocol::DevMDStdThreadProtocol(RCShdPtr<DevMDStdFifo> fifo)
+    : _fifo(std::move(fifo)) {}
+
+DevMDStdThreadProtocol::~DevMDStdThreadProtocol() = default;
+
+void DevMDStdThreadProtocol::consume() {
+    DevANOQueueEntry entry = _fifo->consume();
+    execute(entry);
+}
+
+bool DevMDStdThreadProtocol::tryConsume() {
+    DevANOQueueEntry entry;
+    if (!_fifo->tryConsume(entry)) return false;
+    execute(entry);
+    return true;
+}
+
+void DevMDStdThreadProtocol::execute(DevANOQueueEntry& entry) {
+    const ObjPtr<DevANO> ano = entry.release();
+    const LgSpan span("device", "request");
+    try {
+        ano->performExecute();
+    } catch (...) {
+        Assertions::traceCurrentException("carrying out a device's request");
+        return;
+    }
+    try {
+        ano->notify();
+    } catch (...) {
+        Assertions::traceCurrentException("telling of a request's completion");
+    }
+}
+
+void DevMDStdThreadProtocol::performBody(MtThread*) {
+    DevMDStdFifo& fifo = *_fifo;
+    const DevWaitGraph::Serving serving(fifo.getTarget());
+    // However the thread ends, nobody waits for it afterwards.
+    struct Closer {
+        DevMDStdFifo& fifo;
+        ~Closer() {
+            try {
+                fifo.close();
+            } catch (...) {
+                Assertions::traceCurrentException("closing a device's queue");
+            }
+        }
+    } closer{fifo};
+    try {
+        performRun();
+    } catch (const DevPrtclEx::ExMDStdFifoClosed&) {
+        if (!fifo.isClosed()) throw;
+    }
+}
+
+void DevMDStdThreadProtocol::performRun() {
+    while (!isLeaving()) consume();
+}
+
+/// Somebody wants the thread gone without having closed the device: the process ends, perhaps.
+void DevMDStdThreadProtocol::performStop(MtThread*) {
+    leave();
+    _fifo->close();
+}
+
+}  // namespace Orv

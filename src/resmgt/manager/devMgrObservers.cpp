@@ -1,0 +1,173 @@
+#include <algorithm>
+#include <utility>
+
+#include "assertions.h"
+#include "devMgrEx.h"
+#include "devMgrObserversPrivate.h"
+#include "devMgrPropertyObserver.h"
+#include "lkLock.h"
+
+namespace Orv {
+
+DevMgrPropertyObserver::~DevMgrPropertyObserver() noexcept(false) = default;
+
+DevMgrPropertyFunctionObserver::DevMgrPropertyFunctionObserver(Function function)
+    : _function(std::move(function)) {}
+
+DevMgrPropertyFunctionObserver::~DevMgrPropertyFunctionObserver() noexcept(false) = default;
+
+RCShdPtr<DevMgrPropertyObserver> DevMgrPropertyFunctionObserver::create(Function function) {
+    return RCShdPtr<DevMgrPropertyObserver>(
+        new DevMgrPropertyFunctionObserver(std::move(function)));
+}
+
+void DevMgrPropertyFunctionObserver::performNotify(const DevMgrPropertyObserverHint& hint) {
+    _function(hint);
+}
+
+namespace {
+
+/// News of a property, on its way to the manager's thread.
+class PropertyANO : public DevANO {
+public:
+    PropertyANO(const RCShdPtr<DevMgrObserverList>& list, unsigned mask)
+        : _list(list), _mask(mask) {}
+    void performExecute() override { _list->deliver(_mask); }
+
+private:
+    const RCShdPtr<DevMgrObserverList> _list;
+    const unsigned _mask;
+};
+
+/// Sends it there. Holds nothing that holds a property, so that nothing owns itself in a circle
+/// when the last observer has gone.
+class PropertyAEO : public DevMDPropertyAEO {
+public:
+    PropertyAEO(const RCShdPtr<DevMgrFifo>& fifo, const RCShdPtr<DevMgrObserverList>& list)
+        : _fifo(fifo), _list(list) {}
+
+    void propertyChanged(unsigned mask) override {
+        _fifo->produce(DevANOQueueEntry(ObjPtr<DevANO>(new PropertyANO(_list, mask))));
+    }
+
+private:
+    const RCShdPtr<DevMgrFifo> _fifo;
+    const RCShdPtr<DevMgrObserverList> _list;
+};
+
+}  // namespace
+
+// --- one property ---
+
+void DevMgrObserverList::add(const RCShdPtr<Entry>& entry) {
+    const LkGuard guard(_mutex);
+    for (const RCShdPtr<Entry>& other : _entries) {
+        if (other->owner == entry->owner && other->observer == entry->observer) return;
+    }
+    _entries.push_back(entry);
+}
+
+RCShdPtr<DevMgrObserverList::Entry> DevMgrObserverList::remove(
+    const void* owner, const DevMgrPropertyObserver& observer) {
+    const LkGuard guard(_mutex);
+    const auto found = std::find_if(_entries.begin(), _entries.end(), [&](const auto& entry) {
+        return entry->owner == owner && entry->observer.get() == &observer;
+    });
+    if (found == _entries.end()) return nullptr;
+    const RCShdPtr<Entry> entry = *found;
+    _entries.erase(found);
+    entry->isDetached = true;
+    return entry;
+}
+
+bool DevMgrObserverList::isEmpty() const {
+    const LkGuard guard(_mutex);
+    return _entries.empty();
+}
+
+void DevMgrObserverList::waitUntilIdle(const Entry& entry) {
+    {
+        const LkGuard guard(_mutex);
+        if (_running != &entry || _runner.isCurrentThread()) return;
+    }
+    // If the observer in turn waits for the calling thread, its wait ends with an error.
+    const DevWaitGraph::Wait wait(DevWaitGraph::Kind::END, _manager->getTarget(), nullptr);
+    const LkGuard guard(_mutex);
+    while (_running == &entry) _idle.wait(guard);
+}
+
+void DevMgrObserverList::deliver(unsigned mask) noexcept {
+    try {
+        std::vector<RCShdPtr<Entry>> entries;
+        {
+            const LkGuard guard(_mutex);
+            entries = _entries;
+        }
+        for (const RCShdPtr<Entry>& entry : entries) call(*entry, mask);
+    } catch (...) {
+        Assertions::traceCurrentException("delivering a property's change");
+    }
+}
+
+void DevMgrObserverList::call(Entry& entry, unsigned mask) noexcept {
+    {
+        const LkGuard guard(_mutex);
+        if (entry.isDetached) return;
+        _running = &entry;
+        _runner.setCurrentThread();
+    }
+    try {
+        entry.observer->performNotify(DevMgrPropertyObserverHint(entry.property, mask));
+    } catch (...) {
+        Assertions::traceCurrentException("telling an observer of a property's change");
+    }
+    const LkGuard guard(_mutex);
+    _running = nullptr;
+    _runner.reset();
+    _idle.broadcast();
+}
+
+// --- all of them ---
+
+void DevMgrObservers::attach(const void* owner, const RCShdPtr<DevMDPropertyAny>& property,
+                             const RCShdPtr<DevMgrPropertyObserver>& observer) {
+    const LiUuid uuid = property->getUuid();
+    const RCShdPtr<DevMgrObserverList::Entry> entry(
+        new DevMgrObserverList::Entry(owner, property, observer));
+    const LkGuard guard(_lock);
+    RCShdPtr<DevMgrObserverList>& list = _lists[uuid];
+    if (!list.isNull()) {
+        list->add(entry);
+        return;
+    }
+    try {
+        list = RCShdPtr<DevMgrObserverList>(new DevMgrObserverList(_fifo));
+        list->add(entry);
+        property->setObserverAEO(ObjPtr<DevMDPropertyAEO>(new PropertyAEO(_fifo, list)));
+    } catch (...) {
+        _lists.erase(uuid);
+        throw;
+    }
+}
+
+void DevMgrObservers::detach(const void* owner, DevMDPropertyAny& property,
+                             const DevMgrPropertyObserver& observer) {
+    RCShdPtr<DevMgrObserverList> list;
+    RCShdPtr<DevMgrObserverList::Entry> entry;
+    {
+        const LkGuard guard(_lock);
+        const auto found = _lists.find(property.getUuid());
+        if (found != _lists.end()) {
+            list = found->second;
+            entry = list->remove(owner, observer);
+        }
+        if (entry.isNull()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+        if (list->isEmpty()) {
+            _lists.erase(found);
+            property.setObserverAEO(nullptr);
+        }
+    }
+    list->waitUntilIdle(*entry);
+}
+
+}  // namespace Orv

@@ -1,0 +1,267 @@
+#include "devMgrStreamAcc.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "assertions.h"
+#include "devMDStreamPrtcl.h"
+#include "devMDStreamSink.h"
+#include "devMDStreamSource.h"
+#include "devMgrEx.h"
+#include "devMgrStreamParser.h"
+#include "rcExUtil.h"
+
+namespace Orv {
+
+namespace {
+
+/// The end as a @p T, which its kind must be.
+template <class T>
+RCShdPtr<T> as(const RCShdPtr<DevMDStream>& end) {
+    RCShdPtr<T> result = RCShdPtr<T>::dynamicCast(end);
+    if (result.isNull()) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
+    return result;
+}
+
+/// Calls every action, whatever some of them throw.
+template <class... Actions>
+void performAll(Actions... actions) noexcept {
+    const auto perform = [](auto action) {
+        try {
+            action();
+        } catch (...) {
+            Assertions::traceCurrentException("disconnecting a stream");
+        }
+    };
+    (perform(actions), ...);
+}
+
+/// Two connected ends, whichever of them is the active one.
+struct Link {
+    DevMgrStreamParser parsed;
+    LiString configString;
+    RCShdPtr<DevMDStream> source;
+    RCShdPtr<DevMDStream> sink;
+
+    bool isPush() const { return parsed.getVerb() == DevMgrStreamParser::PUSH; }
+    const RCShdPtr<DevMDStream>& getActive() const { return isPush() ? source : sink; }
+    const RCShdPtr<DevMDStream>& getPassive() const { return isPush() ? sink : source; }
+
+    void checkKinds() const {
+        as<DevMDStreamSource>(source);
+        as<DevMDStreamSink>(sink);
+    }
+
+    void start() const {
+        if (isPush()) {
+            startEnds(*as<DevMDStreamActiveSource>(source), as<DevMDStreamPassiveSink>(sink));
+        } else {
+            startEnds(*as<DevMDStreamActiveSink>(sink), as<DevMDStreamPassiveSource>(source));
+        }
+    }
+
+    /// The passive end is stopped when nothing can reach it any more, a blocked pull ended first.
+    void stop() const noexcept {
+        DevMDStream& active = *getActive();
+        DevMDStream& passive = *getPassive();
+        const auto stopPassive = [&] { passive.stop(); };
+        const auto stopActive = [&] { active.stop(); };
+        if (isPush()) {
+            auto& end = dynamic_cast<DevMDStreamActiveSource&>(active);
+            performAll(stopActive, [&] { end.disconnect(); }, stopPassive);
+        } else {
+            auto& end = dynamic_cast<DevMDStreamActiveSink&>(active);
+            performAll(stopActive, stopPassive, [&] { end.disconnect(); });
+        }
+    }
+
+private:
+    template <class Active, class Passive>
+    static void startEnds(Active& active, const RCShdPtr<Passive>& passive) {
+        active.connect(passive);
+        try {
+            passive->start();
+            try {
+                active.start();
+            } catch (...) {
+                performAll([&] { passive->stop(); });
+                throw;
+            }
+        } catch (...) {
+            performAll([&] { active.disconnect(); });
+            throw;
+        }
+    }
+};
+
+class StreamAccImp : public DevMgrStreamAcc {
+public:
+    explicit StreamAccImp(RCShdPtr<DevMgrMediator> mediator) : _mediator(std::move(mediator)) {
+        if (_mediator.isNull()) RCExUtil::throwExNullPtr();
+    }
+
+    ~StreamAccImp() override {
+        std::vector<Link> links;
+        {
+            const LkGuard guard(_mediator->getConfigLock());
+            links.swap(_links);
+        }
+        for (const Link& link : links) link.stop();
+    }
+
+    void connect(const LiString& configString) override;
+    void disconnect(const LiString& configString) override;
+    std::vector<Connection> getConnections() const override;
+    void registerStream(const LiString& name, RCShdPtr<DevMDStream> stream) override;
+    void deregisterStream(const LiString& name) override;
+
+private:
+    const RCShdPtr<DevMgrMediator> _mediator;
+    // Both under the configuration lock.
+    DevNameMap<RCShdPtr<DevMDStream>> _ends;
+    std::vector<Link> _links;
+
+    RCShdPtr<DevMDStream> getEnd(const LiString& device, const LiString& stream);
+    RCShdPtr<DevMDStream> findInDevice(const LiString& device, const LiString& stream);
+    void reserveEnds(const Link& link);
+    bool isRegisteredNoGuard(const StreamId& id) const { return _ends.find(id.getId()) != nullptr; }
+};
+
+void StreamAccImp::connect(const LiString& configString) {
+    const DevMgrStreamParser parsed(configString);
+    const StreamId sourceStreamId(parsed.getSourceDevice(), parsed.getSourceStream());
+    const StreamId sinkStreamId(parsed.getSinkDevice(), parsed.getSinkStream());
+    Link link{parsed, configString, nullptr, nullptr};
+    link.source = getEnd(parsed.getSourceDevice(), parsed.getSourceStream());
+    link.sink = getEnd(parsed.getSinkDevice(), parsed.getSinkStream());
+    {
+        const LkGuard guard(_mediator->getConfigLock());
+        ORV_ASSERT_TEXT(isRegisteredNoGuard(sourceStreamId),
+                        "isRegisteredNoGuard( sourceStreamId )");
+        ORV_ASSERT_TEXT(isRegisteredNoGuard(sinkStreamId), "isRegisteredNoGuard( sinkStreamId )");
+        _links.reserve(_links.size() + 1);
+        reserveEnds(link);
+    }
+    // The ends are started with the lock free: what devices do then may need it.
+    struct Reservation {
+        DevMgrMediator& mediator;
+        const Link& link;
+        ~Reservation() {
+            const LkGuard guard(mediator.getConfigLock());
+            mediator.release(*link.source);
+            mediator.release(*link.sink);
+        }
+    } const reservation{*_mediator, link};
+    link.checkKinds();
+    if (!link.sink->isCompatible(link.source->getDescription())) {
+        throw DevMgrEx::StreamsNotCompatible(ORV_FILE, __LINE__, configString.getChars());
+    }
+    link.start();
+    try {
+        const LkGuard guard(_mediator->getConfigLock());
+        _links.push_back(link);
+    } catch (...) {
+        link.stop();
+        throw;
+    }
+}
+
+/// The end of that name; what lies in a device is registered when it is first named.
+RCShdPtr<DevMDStream> StreamAccImp::getEnd(const LiString& device, const LiString& stream) {
+    const StreamId id(device, stream);
+    {
+        const LkGuard guard(_mediator->getConfigLock());
+        if (const RCShdPtr<DevMDStream>* const found = _ends.find(id.getId())) return *found;
+    }
+    if (device.isEmpty()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    const RCShdPtr<DevMDStream> end = findInDevice(device, stream);
+    const LkGuard guard(_mediator->getConfigLock());
+    _ends.insert(id.getId(), end);
+    return end;
+}
+
+RCShdPtr<DevMDStream> StreamAccImp::findInDevice(const LiString& device, const LiString& stream) {
+    const RCShdPtr<DevMDPrtcl> prtcl = _mediator->getPrtcl(device);
+    auto* const streams = dynamic_cast<DevMDStreamPrtcl*>(prtcl.get());
+    if (streams == nullptr) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
+    for (auto iter = streams->performGetStreams(); !iter.atEnd(); iter.next()) {
+        if (iter.item()->getName() == stream) return iter.item();
+    }
+    throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+}
+
+void StreamAccImp::reserveEnds(const Link& link) {
+    const StreamId id(link.parsed.getSourceDevice(), link.parsed.getSourceStream());
+    const auto refuse = [&] {
+        throw DevMgrEx::StreamNotAvailable(ORV_FILE, __LINE__, id.getId().getChars());
+    };
+    if (!link.source->isAvailable() || !_mediator->reserve(*link.source)) refuse();
+    if (link.sink->isAvailable() && _mediator->reserve(*link.sink)) return;
+    _mediator->release(*link.source);
+    refuse();
+}
+
+void StreamAccImp::disconnect(const LiString& configString) {
+    const DevMgrStreamParser parsed(configString);
+    const auto idOf = [](const LiString& device, const LiString& stream) {
+        return StreamId(device, stream).getId();
+    };
+    const auto isMeant = [&](const Link& link) {
+        return link.parsed.getVerb() == parsed.getVerb() &&
+               idOf(link.parsed.getSourceDevice(), link.parsed.getSourceStream()) ==
+                   idOf(parsed.getSourceDevice(), parsed.getSourceStream()) &&
+               idOf(link.parsed.getSinkDevice(), link.parsed.getSinkStream()) ==
+                   idOf(parsed.getSinkDevice(), parsed.getSinkStream());
+    };
+    std::vector<Link> found;
+    {
+        const LkGuard guard(_mediator->getConfigLock());
+        const auto link = std::find_if(_links.begin(), _links.end(), isMeant);
+        if (link == _links.end()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+        found.push_back(*link);
+        _links.erase(link);
+    }
+    found.front().stop();
+}
+
+std::vector<DevMgrStreamAcc::Connection> StreamAccImp::getConnections() const {
+    std::vector<Connection> result;
+    const LkGuard guard(_mediator->getConfigLock());
+    for (const Link& link : _links) {
+        result.push_back({link.configString, link.getActive()->getState()});
+    }
+    return result;
+}
+
+void StreamAccImp::registerStream(const LiString& name, RCShdPtr<DevMDStream> stream) {
+    if (stream.isNull()) RCExUtil::throwExNullPtr();
+    const LkGuard guard(_mediator->getConfigLock());
+    if (!_ends.insert(StreamId(LiString(), name).getId(), std::move(stream))) {
+        throw DevMgrEx::NameNotUnique(ORV_FILE, __LINE__);
+    }
+}
+
+void StreamAccImp::deregisterStream(const LiString& name) {
+    const StreamId id(LiString(), name);
+    RCShdPtr<DevMDStream> stream;
+    const LkGuard guard(_mediator->getConfigLock());
+    if (const RCShdPtr<DevMDStream>* const found = _ends.find(id.getId())) stream = *found;
+    if (stream.isNull()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    const bool isConnected = std::any_of(_links.begin(), _links.end(), [&](const Link& link) {
+        return link.source == stream || link.sink == stream;
+    });
+    if (isConnected) {
+        throw DevMgrEx::StreamNotAvailable(ORV_FILE, __LINE__, id.getId().getChars());
+    }
+    _ends.erase(id.getId());
+}
+
+}  // namespace
+
+DevMgrStreamAcc::~DevMgrStreamAcc() = default;
+
+ObjPtrRet<DevMgrStreamAcc> DevMgrStreamAcc::create(RCShdPtr<DevMgrMediator> mediator) {
+    return ObjPtrRet<DevMgrStreamAcc>(new StreamAccImp(std::move(mediator)));
+}
+
+}  // namespace Orv
