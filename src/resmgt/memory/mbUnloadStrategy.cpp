@@ -1,0 +1,7 @@
+#include "mbUnloadStrategy.h"
+
+namespace Orv {
+
+MbUnloadStrategy::~MbUnloadStrategy() = default;
+
+}  // namespace Orv
