@@ -43,5 +43,8 @@ public:
                  : Orv::Assertions::throwSysAssertionFailed(ORV_FILE, __LINE__, text, osError))
 
 /// ORV_ASSERT for a destructor.
-#define ORV_ASSERT_IN_DESTRUCTOR(condition) \
-    ((condition) ? void() : Orv::Assertions::reportAssertionFailed(ORV_FILE, __LINE__, #condition))
+#define ORV_ASSERT_IN_DESTRUCTOR(condition) ORV_ASSERT_IN_DESTRUCTOR_TEXT(condition, #condition)
+
+/// The same with a text of its own.
+#define ORV_ASSERT_IN_DESTRUCTOR_TEXT(condition, text) \
+    ((condition) ? void() : Orv::Assertions::reportAssertionFailed(ORV_FILE, __LINE__, text))

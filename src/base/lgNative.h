@@ -5,12 +5,10 @@
 #if defined(_WIN32)
 #include "lgFileWindows.h"
 #include "lgSystemWindows.h"
-#include "lgThreadSlotWindows.h"
 #include "lgWakeupWindows.h"
 #else
 #include "lgFilePosix.h"
 #include "lgSystemPosix.h"
-#include "lgThreadSlotPosix.h"
 #include "lgWakeupPosix.h"
 #endif
 
@@ -19,12 +17,10 @@ namespace Orv {
 #if defined(_WIN32)
 using LgFile = LgFileWindows;
 using LgSystem = LgSystemWindows;
-using LgThreadSlot = LgThreadSlotWindows;
 using LgWakeup = LgWakeupWindows;
 #else
 using LgFile = LgFilePosix;
 using LgSystem = LgSystemPosix;
-using LgThreadSlot = LgThreadSlotPosix;
 using LgWakeup = LgWakeupPosix;
 #endif
 

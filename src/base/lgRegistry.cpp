@@ -10,6 +10,7 @@
 #include "lgDrainPrivate.h"
 #include "lgNative.h"
 #include "lgTextSink.h"
+#include "threadSlot.h"
 
 namespace Orv {
 
@@ -27,7 +28,7 @@ struct LgRegistry::Parts {
     LgDrainLock lock;
     LgDrain drain ORV_GUARDED_BY(lock);
     LgWakeup wakeup;
-    LgThreadSlot threadSlot{ThreadState::end};
+    ThreadSlot threadSlot{ThreadSlot::LOG, ThreadState::end};
     const std::shared_ptr<LgSink> standardError = std::make_shared<LgStandardErrorSink>();
 
     LgDrain::Result drainOnce(LgRegistry& registry) noexcept ORV_REQUIRES(lock);
@@ -68,9 +69,8 @@ LgThread LgRegistry::makeThread() {
 
 /// The calling thread's state, made at first; null when the thread's end has been noticed.
 LgRegistry::ThreadState* LgRegistry::getState() {
-    void* const value = _parts->threadSlot.get();
-    if (value == LgThreadSlot::ENDED) return nullptr;
-    if (value != nullptr) return static_cast<ThreadState*>(value);
+    if (void* const value = _parts->threadSlot.get()) return static_cast<ThreadState*>(value);
+    if (ThreadSlot::hasEnded()) return nullptr;
     auto state = std::make_unique<ThreadState>(ThreadState{.thread = makeThread()});
     _parts->threadSlot.set(state.get());
     return state.release();
@@ -96,7 +96,7 @@ void LgRegistry::registerThread(std::string_view name) {
 
 void LgRegistry::unregisterThread() noexcept {
     void* const value = _parts->threadSlot.get();
-    if (value == nullptr || value == LgThreadSlot::ENDED) return;
+    if (value == nullptr) return;
     LgQueue* const queue = std::exchange(static_cast<ThreadState*>(value)->queue, nullptr);
     if (queue != nullptr) abandon(*queue);
 }

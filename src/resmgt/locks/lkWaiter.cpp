@@ -2,6 +2,7 @@
 #include <utility>
 
 #include "lkWaiterPrivate.h"
+#include "threadSlot.h"
 
 namespace Orv {
 
@@ -31,11 +32,20 @@ private:
     }
 };
 
-LkWaiter::Use::Use() : _waiter(LkWaiterSlot::get()) {
+namespace {
+
+/// Each thread's own waiter.
+constinit ThreadSlot ownWaiter(ThreadSlot::WAITS, [](void* waiter) noexcept {
+    LkWaiterPool::giveBack(*static_cast<LkWaiter*>(waiter));
+});
+
+}  // namespace
+
+LkWaiter::Use::Use() : _waiter(static_cast<LkWaiter*>(ownWaiter.get())) {
     if (_waiter == nullptr) {
         _waiter = &LkWaiterPool::take();
         // A wait in the last destructors of a thread has its waiter for this once.
-        _isBorrowed = !LkWaiterSlot::set(*_waiter, LkWaiterPool::giveBack);
+        _isBorrowed = !ownWaiter.set(_waiter);
     }
     _waiter->prepare();
 }

@@ -1,5 +1,7 @@
 #include "mtSpecificDataRegistry.h"
 
+#include <algorithm>
+#include <atomic>
 #include <exception>
 #include <iterator>
 
@@ -7,6 +9,7 @@
 #include "lkGuard.h"
 #include "mtNative.h"
 #include "mtOpaqueData.h"
+#include "threadSlot.h"
 
 namespace Orv {
 
@@ -22,18 +25,41 @@ MtSpecificDataRegistry& MtSpecificDataRegistry::getInstance() {
     return *registry;
 }
 
+std::uintptr_t MtSpecificDataRegistry::getThreadNumber() {
+    static constinit std::atomic<std::uintptr_t> lastNumber{0};
+    if (void* const number = _ownNumber.get()) return reinterpret_cast<std::uintptr_t>(number);
+    const std::uintptr_t number = lastNumber.fetch_add(1, std::memory_order_relaxed) + 1;
+    return _ownNumber.set(reinterpret_cast<void*>(number)) ? number : 0;
+}
+
+constinit ThreadSlot MtSpecificDataRegistry::_ownNumber(ThreadSlot::THREAD_DATA, noticeEnd);
+
+void MtSpecificDataRegistry::noticeEnd(void* number) noexcept {
+    try {
+        getInstance().removeThread(reinterpret_cast<std::uintptr_t>(number));
+    } catch (...) {
+        Assertions::traceCurrentException("deleting the data of a thread that ends");
+    }
+}
+
 void MtSpecificDataRegistry::addSpecificData(const MtOpaqueData* data) {
     ORV_ASSERT_TEXT(data != nullptr, "data");
-    MtThreadEndNative::watchCallingThread();
+    const std::uintptr_t number = getThreadNumber();
     const LkGuard guard(_lock);
-    _entries.emplace(LkThreadId::CURRENT_THREAD, Entry{data, data->getSpecific()});
+    _entries.emplace(number, Entry{data, data->getSpecific()});
 }
 
 void MtSpecificDataRegistry::removeSpecificData() {
+    if (const void* const number = _ownNumber.get()) {
+        removeThread(reinterpret_cast<std::uintptr_t>(number));
+    }
+}
+
+void MtSpecificDataRegistry::removeThread(std::uintptr_t number) {
     std::exception_ptr firstError;
     for (int nbDeletions = 0; nbDeletions < maxNbDeletions; ++nbDeletions) {
         try {
-            if (removeFirst()) continue;
+            if (removeFirst(number)) continue;
         } catch (...) {
             if (!firstError) firstError = std::current_exception();
             continue;
@@ -46,9 +72,9 @@ void MtSpecificDataRegistry::removeSpecificData() {
 }
 
 /// Deletes one value of the calling thread; false if it has none.
-bool MtSpecificDataRegistry::removeFirst() {
+bool MtSpecificDataRegistry::removeFirst(std::uintptr_t number) {
     LkGuard guard(_lock);
-    const auto found = _entries.find(LkThreadId::CURRENT_THREAD);
+    const auto found = _entries.find(number);
     if (found == _entries.end()) return false;
     // The slot may go as soon as it holds no more values, so it is not used after the lock.
     const MtOpaqueData::Deleter deleter = found->second.data->_deleter;
@@ -61,17 +87,22 @@ bool MtSpecificDataRegistry::removeFirst() {
 }
 
 void MtSpecificDataRegistry::removeSpecificData(const MtOpaqueData* data) {
+    void* const value = data->getSpecific();
+    if (value == nullptr) return;
     LkGuard guard(_lock);
-    const auto [first, last] = _entries.equal_range(LkThreadId::CURRENT_THREAD);
-    for (auto entry = first; entry != last; ++entry) {
-        if (entry->second.data != data) continue;
-        void* const value = entry->second.value;
-        data->_native->setValue(nullptr);
-        _entries.erase(entry);
-        guard.unlock();
-        data->_deleter(value);
-        return;
-    }
+    const auto [first, last] = _entries.equal_range(getThreadNumber());
+    const auto found = std::find_if(first, last, [&](const Entries::value_type& entry) {
+        return entry.second.data == data && entry.second.value == value;
+    });
+    data->_native->setValue(nullptr);
+    if (found != last) _entries.erase(found);
+    guard.unlock();
+    data->_deleter(value);
+}
+
+void MtSpecificDataRegistry::forgetThread(std::uintptr_t number) noexcept {
+    const LkGuard guard(_lock);
+    _entries.erase(number);
 }
 
 void MtSpecificDataRegistry::removeSlot(const MtOpaqueData* data) noexcept {

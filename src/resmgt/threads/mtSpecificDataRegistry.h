@@ -1,12 +1,13 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <map>
 
 #include "lkRecLock.h"
-#include "lkThreadId.h"
 #include "resmgtApi.h"
 #include "threadSafety.h"
+#include "threadSlot.h"
 
 namespace Orv {
 
@@ -33,6 +34,15 @@ public:
     /// Deletes the values of all threads in one slot, which is about to go; traces what they throw.
     void removeSlot(const MtOpaqueData* data) noexcept;
 
+    /// Forgets the values of a thread that was ended by force, without deleting them: it may have
+    /// been at work on any of them.
+    void forgetThread(std::uintptr_t number) noexcept;
+
+    /// The calling thread's number, by which values are kept: unlike the system's it never comes
+    /// back. 0 once the thread's end has been dealt with; what is made then stays until its slot
+    /// goes.
+    static std::uintptr_t getThreadNumber();
+
     std::size_t getNbValues() const;  ///< Of all threads in all slots; a snapshot.
 
 private:
@@ -40,14 +50,18 @@ private:
         const MtOpaqueData* data;
         void* value;
     };
-    using Entries = std::multimap<LkThreadId, Entry>;
+    using Entries = std::multimap<std::uintptr_t, Entry>;
+
+    static ThreadSlot _ownNumber;  // each thread's
 
     mutable LkRecLock _lock{"MtSpecificDataRegistry"};
     Entries _entries ORV_GUARDED_BY(_lock);
 
     MtSpecificDataRegistry() = default;
 
-    bool removeFirst();
+    void removeThread(std::uintptr_t number);
+    bool removeFirst(std::uintptr_t number);
+    static void noticeEnd(void* number) noexcept;
 };
 
 }  // namespace Orv

@@ -3,13 +3,13 @@
 #include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
-#include <sched.h>
 #include <string>
 #include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include "envVar.h"
+#include "mtProcessorsPosix.h"
 #include "mtUtil.h"
 #include "osError.h"
 #include "trace.h"
@@ -44,11 +44,7 @@ int probe(int file, const char* byte) {
 }  // namespace
 
 int MtUtil::getNbProcessors() {
-    cpu_set_t set;
-    // Of the process, which is its first thread: the calling one may be placed.
-    if (::sched_getaffinity(::getpid(), sizeof set, &set) == 0) return CPU_COUNT(&set);
-    const long nbOnline = ::sysconf(_SC_NPROCESSORS_ONLN);
-    return nbOnline > 0 ? static_cast<int>(nbOnline) : 1;
+    return MtProcessorsPosix::getNumber();
 }
 
 int MtUtil::testWritable(const void* address, int length) {

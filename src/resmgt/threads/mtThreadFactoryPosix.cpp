@@ -1,0 +1,11 @@
+#include "mtThreadFactoryPosix.h"
+
+#include <unistd.h>
+
+namespace Orv {
+
+bool MtThreadFactoryPosix::isOnMainThread() noexcept {
+    return ::gettid() == ::getpid();
+}
+
+}  // namespace Orv

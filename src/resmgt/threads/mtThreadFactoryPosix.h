@@ -1,0 +1,11 @@
+#pragma once
+
+namespace Orv {
+
+/// MtThreadFactory's part of the system.
+class MtThreadFactoryPosix {
+public:
+    static bool isOnMainThread() noexcept;  ///< Whether the process began with the calling thread.
+};
+
+}  // namespace Orv
