@@ -23,6 +23,7 @@ SeSyncEngine::SeSyncEngine() = default;
 SeSyncEngine::~SeSyncEngine() {
     try {
         const Generators generators = copyGenerators(nullptr);
+        if (generators.empty()) return;
         for (const GeneratorPtr& generator : generators) generator->requestStop();
         stopAll(generators);
     } catch (...) {
