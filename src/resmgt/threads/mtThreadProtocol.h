@@ -19,7 +19,7 @@ class MtThread;
 ///   that makes, stops, cancels or destroys it. No lock of the thread is held in any of them.
 class ORV_RESMGT_API MtThreadProtocol {
 public:
-    virtual ~MtThreadProtocol() = default;
+    virtual ~MtThreadProtocol() noexcept(false) = default;  // a member may assert in its own
 
     /// The thread has taken the protocol; it does not run yet.
     virtual void performAttach(MtThread*) {}
