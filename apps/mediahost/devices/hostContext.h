@@ -1,0 +1,56 @@
+#pragma once
+
+#include <cstdint>
+#include <exception>
+#include <filesystem>
+#include <set>
+#include <string>
+
+#include <orv/liTimeCode.h>
+#include <orv/lkMutex.h>
+#include <orv/lkSema.h>
+#include <orv/mbManager.h>
+#include <orv/rcShdPtr.h>
+
+#include "pacer.h"
+
+namespace MediaHost {
+
+/// What the devices of one host share.
+///
+/// - Threads: the settings are only read once there are devices; all else by any thread.
+struct HostContext {
+    Orv::RCShdPtr<Orv::MbManager> pictures;  ///< Memory for pictures, under the budget.
+    Orv::RCShdPtr<Orv::MbManager> sounds;    ///< Memory for sound.
+    std::uint64_t pictureBytes = 0;          ///< The budget.
+    Orv::RCShdPtr<Orv::LiTimeCode> timecode;
+    std::filesystem::path folder;  ///< Where files go; empty: none are written.
+    bool isPaced = false;
+    double speed = 1;  ///< Against real time, if paced.
+    double beatsPerSecond = 0;  ///< Of the clock; 0: as many as the sources have pictures.
+    bool isReverse = false;
+    std::int64_t nbLoops = 1;  ///< 0: for ever.
+
+    Pacer pacer;
+
+    /// The devices at the ends of streams, which have to end before the show is over.
+    void expectEnd(const std::string& device);
+    void reportEnd(const std::string& device);
+    bool hasEnded() const;
+
+    /// The first failure counts; the show is over with it.
+    void reportFailure(const std::string& device, std::exception_ptr error);
+    void rethrowFailure() const;
+
+    /// Waits until something is reported, or the time is over.
+    void waitForNews(double seconds);
+
+private:
+    mutable Orv::LkMutex _mutex{"HostContext"};
+    Orv::LkSema _news{"HostContext news", 0};
+    std::set<std::string> _awaited;
+    bool _isAnyAwaited = false;
+    std::exception_ptr _failure;
+};
+
+}  // namespace MediaHost
