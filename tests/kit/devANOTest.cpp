@@ -68,7 +68,8 @@ TEST(DevANOQueueEntry, hasOneOwner) {
     DevANOQueueEntry third;
     third = second;
     EXPECT_TRUE(second.isEmpty());
-    third = third;
+    DevANOQueueEntry& same = third;
+    third = same;
     const ObjPtr<DevANO> released = third.release();
     EXPECT_EQ(released.get(), ano);
     EXPECT_TRUE(third.isEmpty());

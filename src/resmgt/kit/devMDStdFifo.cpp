@@ -41,17 +41,16 @@ DevMDStdFifo::DevMDStdFifo(const RCShdPtr<DevMDStdFifoObs>& observer, int capaci
 
 DevMDStdFifo::~DevMDStdFifo() noexcept(false) = default;
 
-bool DevMDStdFifo::enter(DevANOQueueEntry& entry, Room room, const LkTimeLimit& limit) {
+DevMDStdFifo::Result DevMDStdFifo::enter(DevANOQueueEntry& entry, Room room,
+                                         const LkTimeLimit& limit) {
     if (entry.isEmpty()) RCExUtil::throwExNullPtr();
-    const Container::Result result = _container.produce(entry, room, limit);
-    if (result == Container::Result::CLOSED) {
-        throw DevPrtclEx::ExMDStdFifoClosed(ORV_FILE, __LINE__);
-    }
-    return result == Container::Result::DONE;
+    const Result result = _container.produce(entry, room, limit);
+    if (result == Result::CLOSED) throw DevPrtclEx::ExMDStdFifoClosed(ORV_FILE, __LINE__);
+    return result;
 }
 
-void DevMDStdFifo::produce(DevANOQueueEntry& entry) {
-    enter(entry, Container::WAIT_FOR_ROOM, LkTimeLimit());
+bool DevMDStdFifo::produce(DevANOQueueEntry& entry) {
+    return enter(entry, Container::WAIT_FOR_ROOM, LkTimeLimit()) == Result::DONE_WAKING;
 }
 
 void DevMDStdFifo::producePastCapacity(DevANOQueueEntry& entry) {
@@ -59,7 +58,7 @@ void DevMDStdFifo::producePastCapacity(DevANOQueueEntry& entry) {
 }
 
 bool DevMDStdFifo::timedProduce(DevANOQueueEntry& entry, const LkTimeLimit& limit) {
-    return enter(entry, Container::WAIT_FOR_ROOM, limit);
+    return enter(entry, Container::WAIT_FOR_ROOM, limit) != Result::TIMED_OUT;
 }
 
 DevANOQueueEntry DevMDStdFifo::consume() {

@@ -19,6 +19,7 @@ namespace Orv {
 class ORV_RESMGT_API DevMDStdFifo : public RCBase<LkCounter<long>> {
 public:
     using Room = MtContainer<DevANOQueueEntry>::Room;
+    using Result = MtContainer<DevANOQueueEntry>::Result;
 
     /// @param capacity  in requests; 0 and less: unbounded.
     explicit DevMDStdFifo(int capacity);
@@ -26,8 +27,9 @@ public:
     ~DevMDStdFifo() noexcept(false) override;
 
     /// Appends the request, waiting for room.
-    void produce(DevANOQueueEntry& entry);
-    void produce(DevANOQueueEntry&& entry) { produce(entry); }
+    /// @return whether a consumer was woken that had slept for long: its answer takes a while.
+    bool produce(DevANOQueueEntry& entry);
+    bool produce(DevANOQueueEntry&& entry) { return produce(entry); }
 
     /// Appends it at once, whether there is room or not: for what must not wait.
     void producePastCapacity(DevANOQueueEntry& entry);
@@ -52,7 +54,7 @@ public:
 private:
     MtContainer<DevANOQueueEntry> _container;
 
-    bool enter(DevANOQueueEntry& entry, Room room, const LkTimeLimit& limit);
+    Result enter(DevANOQueueEntry& entry, Room room, const LkTimeLimit& limit);
 };
 
 }  // namespace Orv

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <atomic>
+#include <chrono>
 #include <cstdint>
 #include <limits>
 #include <vector>
@@ -42,7 +43,15 @@ public:
 template <class Entry>
 class MtContainer : private DevWaitGraph::Breaker {
 public:
-    enum class Result { DONE, TIMED_OUT, CLOSED };
+    enum class Result {
+        DONE,
+        DONE_WAKING,  ///< Done, and a consumer woken for it that had slept for long.
+        TIMED_OUT,
+        CLOSED
+    };
+    /// A sleep longer than that says that requests come far apart.
+    static constexpr std::chrono::microseconds LONG_SLEEP{50};
+
     enum Room { WAIT_FOR_ROOM, PAST_CAPACITY };
 
     /// @param name  of the mutex; borrowed, must outlive the container.
@@ -56,7 +65,7 @@ public:
     /// Asserts that there is none yet.
     void setObserver(RCShdPtr<MtContainerObserver<Entry>> observer);
 
-    /// Appends the entry. If the result is not DONE the caller still has it.
+    /// Appends the entry, with a result of DONE or DONE_WAKING; else the caller still has it.
     Result produce(Entry& entry, Room room = WAIT_FOR_ROOM, const LkTimeLimit& limit = {});
 
     /// Takes the first entry, waiting for one; CLOSED when none can come any more.
@@ -75,13 +84,27 @@ public:
     DevWaitGraph::Target& getTarget() noexcept { return _target; }
 
 private:
-    /// Threads that sleep at a pulse, and those of them for whom a pulse is on its way.
-    struct Sleepers {
-        std::atomic<int> nbWaiting{0};
-        int nbPulsed = 0;
+    /// Threads that sleep at a pulse, and how many of them have one on its way; never more pulses
+    /// than threads.
+    class Sleepers {
+    public:
+        bool isEmpty() const noexcept { return _counts.load() == 0; }
+        void enter() noexcept { _counts.fetch_add(ONE_WAITING); }
+        void leavePulsed() noexcept { _counts.fetch_sub(ONE_WAITING + 1); }
 
-        bool wakeOne() noexcept;
-        int wakeAll() noexcept;
+        /// @return false if all have a pulse on its way, so that one of them is the caller's.
+        bool leaveUnpulsed() noexcept;
+
+        bool wakeOne() noexcept;  ///< Whether to pulse.
+        int wakeAll() noexcept;   ///< How often to pulse.
+
+    private:
+        static constexpr std::uint64_t ONE_WAITING = std::uint64_t{1} << 32;
+        std::atomic<std::uint64_t> _counts{0};  // those that wait in the upper half
+
+        static bool areAllPulsed(std::uint64_t counts) noexcept {
+            return counts / ONE_WAITING == counts % ONE_WAITING;
+        }
     };
 
     // The consumers' side
@@ -90,6 +113,8 @@ private:
     std::size_t _nextOut ORV_GUARDED_BY(_outLock) = 0;
     std::atomic<std::size_t> _nbOut{0};  // written under _outLock
     LkAdaptiveWait _entryLook;
+    alignas(64) std::atomic<std::uint32_t> _nbArrivals{
+        0};  // told when the producer has left _mutex
 
     // The producers' side; _outLock is taken before _mutex.
     alignas(64) LkMutex _mutex;
@@ -99,16 +124,16 @@ private:
     std::atomic<bool> _isObserved{false};
     const std::size_t _capacity;
     LkAdaptiveWait _roomLook;
-    Sleepers _consumers ORV_GUARDED_BY(_mutex), _producers;  // nbPulsed under _mutex
+    Sleepers _consumers, _producers;
+    LkTimeLimit::Clock::time_point _asleepSince ORV_GUARDED_BY(_mutex);  // the last consumer
     LkPulse _nonEmpty, _nonFull;
     RCShdPtr<MtContainerObserver<Entry>> _observer;
     DevWaitGraph::Target _target;
 
     bool takeOut(Entry& entry) ORV_REQUIRES(_outLock);
     bool refill() ORV_REQUIRES(_outLock);
-    void waitForEntry();
+    void waitForEntry(std::uint32_t nbArrivalsSeen);
     bool waitForRoom(const LkTimeLimit& limit);
-    void wakeProducer();
     void letGo() override;
     void sleep(const LkGuard<const LkMutex>& guard, Sleepers& sleepers, LkPulse& pulse,
                const LkTimeLimit& limit);

@@ -21,6 +21,11 @@ void LkUnnamedSema::wait() {
     _queue.wait(LkTimeLimit());
 }
 
+void LkUnnamedSema::waitAsleep() {
+    ORV_ASSERT(isValid());
+    _queue.wait(LkTimeLimit(), LkWaitQueue::Look::NONE);
+}
+
 bool LkUnnamedSema::tryWait() {
     ORV_ASSERT_TEXT(isValid(), "result == WAIT_TIMEOUT");
     return _queue.tryWait();

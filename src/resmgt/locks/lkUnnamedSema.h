@@ -24,6 +24,11 @@ public:
 
     void post();  ///< Asserts if the count is 2147483647 already.
     void wait();  ///< Blocks, without limit, until it has taken one from the count.
+
+    /// Like wait(), but sleeps at once: for a partner that sleeps itself and had to be woken. It then
+    /// finds this processor free, which is quicker than to wake another one.
+    void waitAsleep();
+
     [[nodiscard]] bool tryWait();  ///< Takes one from the count if that is not 0.
 
     bool isValid() const noexcept { return _errno == 0; }

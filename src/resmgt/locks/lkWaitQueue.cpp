@@ -79,11 +79,11 @@ void LkWaitQueue::reset() noexcept {
     unlock(0);
 }
 
-bool LkWaitQueue::wait(const LkTimeLimit& limit) {
+bool LkWaitQueue::wait(const LkTimeLimit& limit, Look look) {
     if (tryWait()) return true;
     if (limit.isZero()) return false;
     const LkWaiter::Use waiter;
-    return !enter(*waiter) || await(*waiter, limit);
+    return !enter(*waiter) || await(*waiter, limit, look);
 }
 
 bool LkWaitQueue::wait(const LkMutex& externalMutex, const LkTimeLimit& limit) {
@@ -94,7 +94,7 @@ bool LkWaitQueue::wait(const LkMutex& externalMutex, const LkTimeLimit& limit) {
             const LkWaiter::Use waiter;
             if (enter(*waiter)) {
                 const Released released(mutex);
-                return await(*waiter, limit);
+                return await(*waiter, limit, Look::ADAPTIVE);
             }
         } else {
             return giveWay(mutex, false);
@@ -204,8 +204,8 @@ bool LkWaitQueue::enter(LkWaiter& waiter) noexcept {
     return true;
 }
 
-bool LkWaitQueue::await(LkWaiter& waiter, const LkTimeLimit& limit) {
-    if (_adaptive.look([&] { return waiter.isReleased(); })) return true;
+bool LkWaitQueue::await(LkWaiter& waiter, const LkTimeLimit& limit, Look look) {
+    if (look == Look::ADAPTIVE && _adaptive.look([&] { return waiter.isReleased(); })) return true;
     if (waiter.sleepUntilReleased(limit)) return true;
     if (leave(waiter)) return false;
     // A release has taken the thread out of the queue as its time ran out, and is about to tell.

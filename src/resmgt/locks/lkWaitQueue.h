@@ -44,9 +44,12 @@ public:
     void releaseAll() noexcept;  ///< Every thread that waits; remembers nothing. For FORGETS.
     void reset() noexcept;       ///< Forgets releases. Threads released already still pass.
 
+    /// Whether a wait may look for its release before it sleeps.
+    enum class Look : std::uint8_t { ADAPTIVE, NONE };
+
     /// Waits without looking at a mutex.
     /// @return false if the time ran out.
-    bool wait(const LkTimeLimit& limit);
+    bool wait(const LkTimeLimit& limit, Look look = Look::ADAPTIVE);
     bool tryWait() noexcept;  ///< Takes, or sees, a remembered release.
 
     /// Joins the queue, releases @p externalMutex for the time of the wait and holds it again on
@@ -78,7 +81,7 @@ private:
     void unlock(Word releases) const noexcept;
     static bool giveWay(LkMutex::Native& mutex, bool result);
     bool enter(LkWaiter& waiter) noexcept;
-    bool await(LkWaiter& waiter, const LkTimeLimit& limit);
+    bool await(LkWaiter& waiter, const LkTimeLimit& limit, Look look);
     bool leave(LkWaiter& waiter) noexcept;
     void unlink(LkWaiter& waiter) noexcept;
     LkWaiter* detachAll() noexcept;

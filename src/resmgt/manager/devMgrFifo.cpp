@@ -13,7 +13,7 @@ DevMgrFifo::~DevMgrFifo() noexcept(false) = default;
 
 void DevMgrFifo::produce(DevANOQueueEntry& entry) {
     if (entry.isEmpty()) RCExUtil::throwExNullPtr();
-    if (_container.produce(entry) == Container::Result::DONE) return;
+    if (_container.produce(entry) != Container::Result::CLOSED) return;
     if (_hasDied.load()) throw DevMgrEx::ThreadEnded(ORV_FILE, __LINE__);
     entry = DevANOQueueEntry();
 }

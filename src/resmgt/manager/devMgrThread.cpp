@@ -105,20 +105,27 @@ public:
         return instance;
     }
 
-    void add(ObjPtr<MtThread> thread, ObjPtr<PriorityRelation> relation) {
+    void add(ObjPtr<MtThread> thread, ObjPtr<PriorityRelation> relation,
+             const RCShdPtr<DevMgrFifo>& fifo) {
         const LkGuard guard(_lock);
-        _threads.emplace_back(std::move(relation), std::move(thread));
+        _threads.push_back({std::move(relation), std::move(thread), fifo});
     }
 
     void joinEnded() {
         const LkGuard guard(_lock);
         std::erase_if(_threads, [](Abandoned& abandoned) {
-            return !abandoned.second->isCurrentThread() && abandoned.second->timedJoin(0);
+            if (abandoned.thread->isCurrentThread() || !abandoned.fifo->isClosed()) return false;
+            abandoned.thread->join();  // closing the queue is the last that it does
+            return true;
         });
     }
 
 private:
-    using Abandoned = std::pair<ObjPtr<PriorityRelation>, ObjPtr<MtThread>>;
+    struct Abandoned {
+        ObjPtr<PriorityRelation> relation;
+        ObjPtr<MtThread> thread;
+        RCShdPtr<DevMgrFifo> fifo;
+    };
 
     LkLock _lock{"DevMgrThread abandoned"};
     std::vector<Abandoned> _threads ORV_GUARDED_BY(_lock);
@@ -174,7 +181,7 @@ void DevMgrThread::close() {
 
 void DevMgrThread::abandon() {
     static_cast<ANOThreadProtocol&>(*_thread->getProtocol()).leave();
-    AbandonedThreads::getInstance().add(std::move(_thread), std::move(_priorityRelation));
+    AbandonedThreads::getInstance().add(std::move(_thread), std::move(_priorityRelation), _fifo);
 }
 
 }  // namespace Orv

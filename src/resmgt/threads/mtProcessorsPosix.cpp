@@ -72,9 +72,10 @@ int MtProcessorsPosix::getNumber() {
 void MtProcessorsPosix::place(pthread_t thread, int number) {
     const std::vector<int>& all = getAll();
     if (all.empty()) return;
+    ORV_ASSERT(number < getNumber());
     Set set(all.back() + 1);
     if (number >= 0) {
-        set.add(all.at(static_cast<std::size_t>(number)));
+        set.add(all[static_cast<std::size_t>(number)]);
     } else {
         for (const int processor : all) set.add(processor);
     }

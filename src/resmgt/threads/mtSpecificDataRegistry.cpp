@@ -125,6 +125,11 @@ void MtSpecificDataRegistry::removeSlot(const MtOpaqueData* data) noexcept {
     }
 }
 
+void MtSpecificDataRegistry::whileLocked(const std::function<void()>& action) const {
+    const LkGuard guard(_lock);
+    action();
+}
+
 std::size_t MtSpecificDataRegistry::getNbValues() const {
     const LkGuard guard(_lock);
     return _entries.size();

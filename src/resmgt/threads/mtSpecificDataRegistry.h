@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <map>
 
 #include "lkRecLock.h"
@@ -37,6 +38,9 @@ public:
     /// Forgets the values of a thread that was ended by force, without deleting them: it may have
     /// been at work on any of them.
     void forgetThread(std::uintptr_t number) noexcept;
+
+    /// For an action during which no other thread may stand in the registry.
+    void whileLocked(const std::function<void()>& action) const;
 
     /// The calling thread's number, by which values are kept: unlike the system's it never comes
     /// back. 0 once the thread's end has been dealt with; what is made then stays until its slot

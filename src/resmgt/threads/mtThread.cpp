@@ -10,6 +10,7 @@
 #include "currentException.h"
 #include "envIntVar.h"
 #include "lgRegistry.h"
+#include "lkAdaptiveWait.h"
 #include "mtEx.h"
 #include "mtNative.h"
 #include "mtPriorityMgr.h"
@@ -96,6 +97,7 @@ MtThread::MtThread(const LiString& name, ObjPtr<MtThreadProtocol> protocol, MtTh
 MtThread::~MtThread() noexcept(false) {
     const bool isOnItself = isCurrentThread() && !_isMainThread;
     if (isOnItself) {
+        const LkGuard starterHasLeft(_lock);
         _native->detach();
     } else if (!_isMainThread) {
         stopAndJoin();
@@ -162,9 +164,10 @@ void MtThread::start() {
         _native->release();
         std::rethrow_exception(std::exchange(_startError, nullptr));
     }
-    const bool isRefused = _isLevelRefused;
-    guard.unlock();
-    if (isRefused) traceRefusal(_name);
+    if (!_isLevelRefused) return;
+    const LiString name = _name;
+    guard.unlock();  // the body may destroy the object from here on
+    traceRefusal(name);
 }
 
 void MtThread::join() {
@@ -331,7 +334,6 @@ void MtThread::finish(Frame& frame) {
         }
     });
     frame.attempt(freeSpecificData);
-    LgRegistry::getInstance().unregisterThread();
     if (frame.thread != nullptr) {
         frame.thread->end(frame.thrown);
     } else if (frame.thrown) {
@@ -396,8 +398,7 @@ bool MtThread::isCancelable() const {
 
 bool MtThread::forceStop() {
     bool isStopped = false;
-    {
-        // With the lock held, so that the thread cannot take it along.
+    MtThreadMgr::get().imp().getThreads().whileLocked([&] {
         const LkGuard guard(_lock);
         if (!_isCancelable) {
             Assertions::throwProgramAborted(ORV_FILE, __LINE__, "_cancelable is FALSE!!!");
@@ -405,10 +406,19 @@ bool MtThread::forceStop() {
         ORV_ASSERT(isRunningNoLock());
         ORV_ASSERT(!_isMainThread);
         ORV_ASSERT(!isCurrentThread());
-        _isForced = true;
-        isStopped = _native->terminate();
-    }
+        isStopped = _hasEnded || terminateNoLock();
+    });
     if (_protocol) _protocol->performCanceled(this);
+    return isStopped;
+}
+
+/// With all locks held that every thread of the process needs now and then: none is taken along.
+bool MtThread::terminateNoLock() {
+    bool isStopped = false;
+    MtSpecificDataRegistry::getInstance().whileLocked([&] {
+        isStopped = _native->terminate();
+        _isForced = true;
+    });
     return isStopped;
 }
 
@@ -472,7 +482,9 @@ bool MtThread::applyClass(bool isRealTime) {
 void MtThread::setProcessorNb(int number) {
     const LkGuard guard(_lock);
     _processorNb = number;
-    if (isProcessorPlaceable(number) && isAliveNoLock()) _native->setProcessor(number);
+    if (!isProcessorPlaceable(number) || !isAliveNoLock()) return;
+    _native->setProcessor(number);
+    LkAdaptiveWait::forgetPlacement();
 }
 
 int MtThread::getProcessorNb() const {

@@ -170,6 +170,7 @@ private:
     bool waitForEnd(const LkTimeLimit& limit, std::uint64_t& run);
     bool waitForJoiner(const LkTimeLimit& limit);
     void noteEndNoLock() ORV_REQUIRES(_lock);
+    bool terminateNoLock() ORV_REQUIRES(_lock);
     void throwThrown(std::uint64_t run);
     void traceThrownNoLock() noexcept ORV_REQUIRES(_lock);
 

@@ -46,6 +46,11 @@ void MtThreadList::forEachLocked(const std::function<void(MtThread&)>& action) c
     for (const SeatPtr& seat : _seats) action(*seat->thread);
 }
 
+void MtThreadList::whileLocked(const std::function<void()>& action) const {
+    const LkGuard guard(_lock);
+    action();
+}
+
 std::size_t MtThreadList::getSize() const {
     const LkGuard guard(_lock);
     return _seats.size();

@@ -35,6 +35,7 @@ public:
 
     /// The same under the lock, for actions that take no lock but those of threads.
     void forEachLocked(const std::function<void(MtThread&)>& action) const;
+    void whileLocked(const std::function<void()>& action) const;
 
     std::size_t getSize() const;
     std::vector<LiString> getNames() const;

@@ -135,7 +135,7 @@ void MtThreadWindows::setProcessor(int number) {
         // The processors of the process are numbered from 0, whichever these are.
         for (int i = 0; i < number; ++i) threadAffinity &= threadAffinity - 1;
         threadAffinity &= ~(threadAffinity - 1);
-        if (threadAffinity == 0) return;  // it has fewer than the machine
+        ORV_ASSERT_TEXT(threadAffinity != 0, "number < getNumber()");
     }
     ORV_ASSERT_SYS(::SetThreadAffinityMask(getTarget(), threadAffinity),
                    "::SetThreadAffinityMask( _threadHandle, threadAffinity )", OsError::getLast());

@@ -1,0 +1,325 @@
+#include <algorithm>
+#include <gtest/gtest.h>
+#include <thread>
+#include <vector>
+
+#include "devPrtclEx.h"
+#include "eventually.h"
+#include "expectThrows.h"
+#include "kitTesting.h"
+#include "rcEx.h"
+
+namespace Orv {
+
+namespace {
+
+using Elem = DevMDStreamElem;
+using State = DevMDStream::State;
+
+class NumberBuf : public DevMDStreamBuf {
+public:
+    explicit NumberBuf(int n) : number(n) {}
+    const int number;
+};
+
+ObjPtr<Elem> numberElem(int number) {
+    return ObjPtr<Elem>(new Elem(RCShdPtr<DevMDStreamBuf>(new NumberBuf(number)), Elem::DATA));
+}
+
+ObjPtr<Elem> newsElem(Elem::Ev ev) {
+    return ObjPtr<Elem>(new Elem(nullptr, ev));
+}
+
+/// A number, or minus one less than what the element tells.
+int codeOf(const Elem& elem) {
+    const auto* const buf = dynamic_cast<const NumberBuf*>(elem.getBuf().get());
+    return buf != nullptr ? buf->number : -elem.getEv();
+}
+
+/// A device with a sink that notes what it is given.
+struct SinkDevice {
+    RCShdPtr<TestDevice> device;
+    RCShdPtr<DevMDStdStreamPassiveSink> sink;
+    std::vector<int> seen;  // of the device's thread, and of the test when that is closed
+    TestCounter nbSeen;
+
+    explicit SinkDevice(int capacity = 25) : device(new TestDevice("sink", capacity)) {
+        sink = device->addSink("input", "", [this](const ObjPtr<Elem>& elem) {
+            seen.push_back(codeOf(*elem));
+            nbSeen.add();
+        });
+        device->performOpen();
+    }
+};
+
+TEST(DevMDStream, compatibilityFollowsTheSinksDescription) {
+    struct Row {
+        const char* sink;
+        const char* source;
+        bool isCompatible;
+    };
+    for (const Row& row : {
+             Row{"", "video/raw;width=720", true},
+             Row{"", "", true},
+             Row{"video/raw", "video/raw", true},
+             Row{"video/raw", "video/h264", false},
+             Row{"video/*", "video/h264", true},
+             Row{"*/*", "audio/pcm;rate=48000", true},
+             Row{"*/raw", "video/h264", false},
+             Row{"video/raw", "video/*", false},
+             Row{"video/raw;width=720", "video/raw;width=720;height=576", true},
+             Row{"video/raw;width=720", "video/raw;width=1920", false},
+             Row{"video/raw;width=720", "video/raw", true},
+             Row{"video/raw;a=1;b=2", "video/raw;b=3;a=1", false},
+             Row{"video/raw;;", "video/raw;width=1", true},
+             Row{"anything", "anything", true},
+             Row{"anything", "video/raw", false},
+             Row{"*/*", "anything", false},
+             Row{"video/raw", "", false},
+         }) {
+        EXPECT_EQ(DevMDStream::areCompatible(row.sink, row.source), row.isCompatible)
+            << row.sink << " <- " << row.source;
+    }
+}
+
+TEST(DevMDStdStreamPrtcl, isFrozenByItsFirstListing) {
+    const RCShdPtr<TestDevice> device(new TestDevice);
+    const auto source = device->addPassiveSource("video", "");
+    EXPECT_TRUE(source->isAvailable());
+    source->start();
+    EXPECT_FALSE(source->isAvailable());
+    source->stop();
+    EXPECT_TRUE(source->isAvailable());
+    EXPECT_EQ(device->performGetStreams().getCardinality(), 1U);
+    expectThrows<DevPrtclEx::ExMDStdAddStream>("Attempt to add stream after iterator created.",
+                                               [&] { device->addPassiveSource("audio", ""); });
+}
+
+TEST(DevMDStdStreamPassiveSink, theDeviceSeesWhatIsPushedAndOneTerminalElementLast) {
+    SinkDevice end;
+    end.sink->push(numberElem(0));  // not started: unseen
+    end.sink->start();
+    end.sink->push(numberElem(1));
+    end.sink->push(newsElem(Elem::GAP));
+    end.sink->push(newsElem(Elem::END));
+    end.sink->push(numberElem(2));
+    end.sink->push(newsElem(Elem::FAILED));
+    end.sink->stop();
+    end.sink->start();
+    end.sink->push(numberElem(3));
+    end.sink->stop();
+    end.sink->push(numberElem(4));
+    end.device->performClose();
+    EXPECT_EQ(end.seen, (std::vector<int>{1, -Elem::GAP, -Elem::END, 3, -Elem::STOPPED}));
+    end.sink->start();
+    EXPECT_THROW(end.sink->push(numberElem(5)), DevPrtclEx::ExMDStdFifoClosed);
+    end.sink->stop();
+    ObjPtr<DevMDStdStreamPassiveSinkANOFactory> factory(
+        new DevMDStdFunctionSinkFactory([](const ObjPtr<Elem>&) {}));
+    DevMDStdStreamPassiveSink loose("loose", "", nullptr, std::move(factory));
+    EXPECT_THROW(loose.push(numberElem(1)), RCEx::ExNullPtr);
+}
+
+TEST(DevMDStdStreamPassiveSink, aFullQueueKeepsStopFromWaiting) {
+    SinkDevice end(1);
+    Gate holds, isHolding;
+    end.device->post([&] {
+        isHolding.open();
+        holds.wait();
+    });
+    isHolding.wait();
+    end.sink->start();
+    EXPECT_TRUE(end.sink->isReady());
+    end.sink->push(numberElem(1));
+    EXPECT_FALSE(end.sink->isReady());
+    end.sink->stop();  // past the capacity
+    holds.open();
+    end.device->performClose();
+    EXPECT_EQ(end.seen, (std::vector<int>{1, -Elem::STOPPED}));
+}
+
+TEST(DevMDStdStreamLoopSource, pushesUntilItsFunctionReturnsAndThenEnds) {
+    SinkDevice end(3);
+    const RCShdPtr<DevMDStdStreamLoopSource> source(
+        new DevMDStdStreamLoopSource("video", "", [](DevMDStdStreamLoopSource& self) {
+            for (int i = 0; i < 100; ++i) EXPECT_TRUE(self.push(numberElem(i)));
+        }));
+    source->connect(end.sink);
+    end.sink->start();
+    source->start();
+    end.nbSeen.waitFor(101);
+    eventually("the source has ended", [&] { return source->getState() == State::ENDED; });
+    EXPECT_FALSE(source->isAvailable()) << "until it is disconnected";
+    source->stop();
+    source->disconnect();
+    end.sink->stop();
+    EXPECT_TRUE(source->isAvailable());
+    end.device->performClose();
+    ASSERT_EQ(end.seen.size(), 101U);
+    for (int i = 0; i < 100; ++i) EXPECT_EQ(end.seen[static_cast<std::size_t>(i)], i);
+    EXPECT_EQ(end.seen.back(), -Elem::END);
+}
+
+TEST(DevMDStdStreamLoopSource, disconnectReturnsWhenItsThreadIsThrough) {
+    for (int round = 0; round < 30; ++round) {
+        SinkDevice end(2);
+        std::atomic<bool> isOver{false};
+        const RCShdPtr<DevMDStdStreamLoopSource> source(
+            new DevMDStdStreamLoopSource("video", "", [&](DevMDStdStreamLoopSource& self) {
+                for (int i = 0; self.push(numberElem(i)); ++i) {
+                }
+                isOver = true;
+            }));
+        source->connect(end.sink);
+        end.sink->start();
+        source->start();
+        end.nbSeen.waitFor(20);
+        source->stop();
+        source->disconnect();
+        EXPECT_TRUE(isOver);
+        end.sink->stop();
+        end.device->performClose();
+        EXPECT_EQ(end.seen.back(), -Elem::STOPPED);
+        EXPECT_EQ(std::count_if(end.seen.begin(), end.seen.end(),
+                                [](int code) { return code <= -Elem::END; }),
+                  1);
+    }
+}
+
+TEST(DevMDStdStreamLoopSource, disconnectOnTheSinksThreadFreesASourceThatItHoldsBack) {
+    SinkDevice end(1);
+    Gate isFull, isOver;
+    const RCShdPtr<DevMDStdStreamLoopSource> source(
+        new DevMDStdStreamLoopSource("video", "", [&](DevMDStdStreamLoopSource& self) {
+            for (int i = 0; self.push(numberElem(i)); ++i) {
+                if (i == 0) isFull.open();
+            }
+        }));
+    Gate starts;
+    end.device->post([&] {
+        starts.wait();
+        isFull.wait();
+        // The source fills the queue that only this thread empties.
+        source->stop();
+        source->disconnect();
+        isOver.open();
+    });
+    source->connect(end.sink);
+    end.sink->start();
+    eventually("the queue is empty", [&] { return end.device->getFifo()->getSize() == 0; });
+    source->start();
+    starts.open();
+    EXPECT_TRUE(isOver.wait());
+    end.sink->stop();
+}
+
+TEST(DevMDStdStreamLoopSource, aLoopThatThrowsAndASinkThatDiesAreFailures) {
+    SinkDevice end;
+    const RCShdPtr<DevMDStdStreamLoopSource> throwing(new DevMDStdStreamLoopSource(
+        "video", "", [](DevMDStdStreamLoopSource&) { throw Death(); }));
+    throwing->connect(end.sink);
+    end.sink->start();
+    throwing->start();
+    end.nbSeen.waitFor(1);
+    eventually("it has failed", [&] { return throwing->getState() == State::FAILED; });
+    throwing->stop();
+    throwing->disconnect();
+    end.sink->stop();
+
+    const RCShdPtr<DevMDStdStreamLoopSource> pushing(
+        new DevMDStdStreamLoopSource("video", "", [](DevMDStdStreamLoopSource& self) {
+            while (self.push(numberElem(1))) {
+            }
+        }));
+    pushing->connect(end.sink);
+    end.sink->start();
+    pushing->start();
+    end.nbSeen.waitFor(5);
+    end.device->performClose();  // in the middle of the stream
+    eventually("it has failed", [&] { return pushing->getState() == State::FAILED; });
+    pushing->stop();
+    pushing->disconnect();
+    end.sink->stop();
+    EXPECT_EQ(end.seen.front(), -Elem::FAILED);
+}
+
+TEST(DevMDStdStreamPassiveSource, losesWhatIsTooMuchAndTellsSo) {
+    DevMDStdStreamPassiveSource source("video", "", 2);
+    EXPECT_FALSE(source.put(numberElem(0))) << "not started";
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), -Elem::STOPPED);
+    source.start();
+    EXPECT_FALSE(source.isReady());
+    for (int i = 1; i <= 4; ++i) EXPECT_TRUE(source.put(numberElem(i)));
+    EXPECT_TRUE(source.isReady());
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), 1);
+    EXPECT_TRUE(source.put(numberElem(5)));
+    EXPECT_FALSE(source.put(newsElem(Elem::END)));
+    EXPECT_FALSE(source.put(numberElem(6)));
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), 2);
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), -Elem::GAP);
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), 5);
+    for (int i = 0; i < 2; ++i) EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), -Elem::END);
+    EXPECT_EQ(source.getState(), State::ENDED);
+    source.stop();
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(source.pull())), -Elem::STOPPED);
+}
+
+TEST(DevMDStdStreamActiveSink, pullsAcrossThreadsUntilItIsStopped) {
+    const RCShdPtr<DevMDStdStreamPassiveSource> source(
+        new DevMDStdStreamPassiveSource("video", "", 1000));
+    DevMDStdStreamActiveSink sink("input", "");
+    EXPECT_EQ(codeOf(*ObjPtr<Elem>(sink.pull())), -Elem::STOPPED);
+    sink.connect(source);
+    source->start();
+    sink.start();
+    TestCounter nbPulled;
+    std::vector<int> seen;
+    std::thread puller([&] {
+        do {
+            seen.push_back(codeOf(*ObjPtr<Elem>(sink.pull())));
+            nbPulled.add();
+        } while (seen.back() >= 0);
+    });
+    for (int i = 0; i < 500; ++i) source->put(numberElem(i));
+    nbPulled.waitFor(500);
+    sink.stop();
+    source->stop();  // ends the pull that waits
+    sink.disconnect();
+    puller.join();
+    ASSERT_EQ(seen.size(), 501U);
+    EXPECT_EQ(seen[499], 499);
+    EXPECT_EQ(seen[500], -Elem::STOPPED);
+}
+
+TEST(DevMDStdStreamPassiveSource, aPullThatItsDeviceWaitsForFails) {
+    RCShdPtr<TestDevice> devices[2] = {RCShdPtr<TestDevice>(new TestDevice("source")),
+                                       RCShdPtr<TestDevice>(new TestDevice("sink"))};
+    const auto source = devices[0]->addPassiveSource("video", "");
+    DevMDStdStreamActiveSink sink("input", "");
+    RCShdPtr<DevMDStdProperty<int>> value;
+    devices[0]->performOpen();
+    sink.connect(source);
+    source->start();
+    sink.start();
+    Gate isAsking, isOver;
+    // The source's device asks the sink's for a value, which pulls from the source's meanwhile.
+    value = devices[1]->addProperty<int>("pulled", "", [&] {
+        isAsking.open();
+        const int code = codeOf(*ObjPtr<Elem>(sink.pull()));
+        return code;
+    });
+    devices[1]->performOpen();
+    int got = 0;
+    devices[0]->post([&] {
+        value->get(got);
+        isOver.open();
+    });
+    EXPECT_TRUE(isOver.wait());
+    EXPECT_TRUE(isAsking.isOpen());
+    EXPECT_EQ(got, -Elem::FAILED);
+    source->stop();
+}
+
+}  // namespace
+
+}  // namespace Orv
