@@ -10,6 +10,11 @@ class DevMgrImp : public DevMgr {
 public:
     DevMgrImp() : _mediator(new DevMgrMediator) {}
 
+    ObjPtrRet<DevMgrSyncSeqAcc> createSyncSeqAcc() override {
+        const LkGuard guard(_mediator->getConfigLock());
+        return DevMgrSyncSeqAcc::create(_mediator);
+    }
+
     ObjPtrRet<DevMgrStreamAcc> createStreamAcc() override {
         const LkGuard guard(_mediator->getConfigLock());
         return DevMgrStreamAcc::create(_mediator);

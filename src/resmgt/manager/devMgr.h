@@ -3,13 +3,14 @@
 #include "devMDPrtcl.h"
 #include "devMgrPropertyAcc.h"
 #include "devMgrStreamAcc.h"
+#include "devMgrSyncSeqAcc.h"
 #include "objPtr.h"
 #include "resmgtApi.h"
 
 namespace Orv {
 
 /// A manager: hosts devices, which it knows by their names in the DevRegistry, and gives access to
-/// their properties and streams. Managers are independent of each other, each with devices and a
+/// their properties, streams and sequences. Managers are independent of each other, each with devices and a
 /// notification thread of its own.
 ///
 /// - Threads: any.
@@ -24,6 +25,7 @@ public:
     DevMgr(const DevMgr&) = delete;
     DevMgr& operator=(const DevMgr&) = delete;
 
+    virtual ObjPtrRet<DevMgrSyncSeqAcc> createSyncSeqAcc() = 0;
     virtual ObjPtrRet<DevMgrStreamAcc> createStreamAcc() = 0;
     virtual ObjPtrRet<DevMgrPropertyAcc> createPropertyAcc() = 0;
 

@@ -46,6 +46,8 @@ public:
     ///   DevMgrEx::NameNotRegistered for an unknown set or property.
     RCShdPtr<DevMDPropertyAny> getProperty(const DevMgrPropertyParser& path);
 
+    bool isManagerThread() const noexcept { return _thread->isCurrentThread(); }
+
     /// Waits for room. @throws DevMgrEx::ThreadEnded
     void postNotification(DevANOQueueEntry& entry) { _fifo->produce(entry); }
 

@@ -1,0 +1,114 @@
+#include "devSeqBoard.h"
+
+#include <algorithm>
+
+#include "devMgrEx.h"
+#include "lkTimeLimit.h"
+
+namespace Orv {
+
+DevSeqBoard::~DevSeqBoard() noexcept(false) = default;
+
+unsigned DevSeqBoard::addNode() {
+    const LkGuard guard(_mutex);
+    _nodes.emplace_back();
+    return static_cast<unsigned>(_nodes.size() - 1);
+}
+
+void DevSeqBoard::link(unsigned node) {
+    const LkGuard guard(_mutex);
+    _nodes[node].isLinked = true;
+    ++_nbLinked;
+    ++countOf(_nodes[node].state);
+}
+
+std::uint32_t& DevSeqBoard::countOf(DevSeqState state) {
+    return _nbIn[static_cast<int>(state)];
+}
+
+void DevSeqBoard::publish(const std::vector<Change>& changes) {
+    const LkGuard guard(_mutex);
+    for (const Change& change : changes) {
+        Node& node = _nodes[change.node];
+        --countOf(node.state);
+        node.state = change.state;
+        ++countOf(node.state);
+    }
+    tellWaiters();
+}
+
+void DevSeqBoard::fail(unsigned node, const LiString& why) {
+    const LkGuard guard(_mutex);
+    if (_nodes[node].failure.isEmpty()) _nodes[node].failure = why;
+    _hasFailed = true;
+}
+
+void DevSeqBoard::end() noexcept {
+    const LkGuard guard(_mutex);
+    _hasFailed = true;
+    tellWaiters();
+}
+
+DevSeqState DevSeqBoard::getState(unsigned node) const {
+    const LkGuard guard(_mutex);
+    return _nodes[node].state;
+}
+
+LiString DevSeqBoard::getFailure(unsigned node) const {
+    const LkGuard guard(_mutex);
+    return _nodes[node].failure;
+}
+
+bool DevSeqBoard::hasFailed() const {
+    const LkGuard guard(_mutex);
+    return _hasFailed;
+}
+
+DevSeqBoard::Outcome DevSeqBoard::judge(DevSeqState state) {
+    if (countOf(state) == _nbLinked) return Outcome::REACHED;
+    const bool hasEnded = state != DevSeqState::FINAL && countOf(DevSeqState::FINAL) > 0;
+    return _hasFailed || hasEnded ? Outcome::IMPOSSIBLE : Outcome::PENDING;
+}
+
+/// What a waiter is told stays true for it, also if it wakes too late to see it.
+void DevSeqBoard::tellWaiters() noexcept {
+    bool isAnyTold = false;
+    for (Waiter* const waiter : _waiters) {
+        if (waiter->outcome != Outcome::PENDING) continue;
+        waiter->outcome = judge(waiter->state);
+        isAnyTold = isAnyTold || waiter->outcome != Outcome::PENDING;
+    }
+    if (isAnyTold) _changed.broadcast();
+}
+
+bool DevSeqBoard::waitFor(DevSeqState state, double seconds) {
+    Waiter waiter{state, Outcome::PENDING};
+    const DevWaitGraph::Wait wait(DevWaitGraph::Kind::ANSWER, _manager, this);
+    if (!wait.isRefused()) await(waiter, wait, seconds);
+    if (waiter.outcome == Outcome::IMPOSSIBLE || wait.isRefused() || wait.isLetGo()) {
+        if (waiter.outcome != Outcome::REACHED) {
+            throw DevMgrEx::SMExecutionError(ORV_FILE, __LINE__);
+        }
+    }
+    return waiter.outcome == Outcome::REACHED;
+}
+
+void DevSeqBoard::await(Waiter& waiter, const DevWaitGraph::Wait& wait, double seconds) {
+    const LkTimeLimit limit(seconds);
+    const LkGuard guard(_mutex);
+    waiter.outcome = judge(waiter.state);
+    _waiters.push_back(&waiter);
+    while (waiter.outcome == Outcome::PENDING && !wait.isLetGo()) {
+        const std::uint32_t milliseconds = limit.getRemainingMilliseconds();
+        if (milliseconds == 0) break;
+        _changed.timedWait(guard, milliseconds * 1e-3);
+    }
+    std::erase(_waiters, &waiter);
+}
+
+void DevSeqBoard::letGo() {
+    const LkGuard guard(_mutex);
+    _changed.broadcast();
+}
+
+}  // namespace Orv
