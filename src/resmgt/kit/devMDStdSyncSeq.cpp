@@ -71,6 +71,13 @@ struct DevMDSyncSeqSignals::Signals : RCBase<LkCounter<long>> {
 DevMDSyncSeqSignals::DevMDSyncSeqSignals(ObjPtr<DevANO> ready, ObjPtr<DevANO> lockLost)
     : _signals(new Signals(std::move(ready), std::move(lockLost))) {}
 
+DevMDSyncSeqSignals::DevMDSyncSeqSignals() noexcept = default;
+DevMDSyncSeqSignals::DevMDSyncSeqSignals(const DevMDSyncSeqSignals&) noexcept = default;
+DevMDSyncSeqSignals::DevMDSyncSeqSignals(DevMDSyncSeqSignals&&) noexcept = default;
+DevMDSyncSeqSignals& DevMDSyncSeqSignals::operator=(const DevMDSyncSeqSignals&) = default;
+DevMDSyncSeqSignals& DevMDSyncSeqSignals::operator=(DevMDSyncSeqSignals&&) = default;
+DevMDSyncSeqSignals::~DevMDSyncSeqSignals() = default;
+
 void DevMDSyncSeqSignals::ready() const {
     if (!_signals.isNull()) _signals->ready->performExecute();
 }
