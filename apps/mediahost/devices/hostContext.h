@@ -1,5 +1,6 @@
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 #include <exception>
 #include <filesystem>
@@ -20,9 +21,9 @@ namespace MediaHost {
 ///
 /// - Threads: the settings are only read once there are devices; all else by any thread.
 struct HostContext {
-    Orv::RCShdPtr<Orv::MbManager> pictures;  ///< Memory for pictures, under the budget.
-    Orv::RCShdPtr<Orv::MbManager> sounds;    ///< Memory for sound.
-    std::uint64_t pictureBytes = 0;          ///< The budget.
+    std::uint64_t cacheBytes = 0;     ///< The budget of pictures.
+    std::int64_t cachePictures = 0;   ///< If not 0: the budget is so many of the first source's.
+    bool isCacheRandom = false;       ///< Which ones give way: any, or those used longest ago.
     Orv::RCShdPtr<Orv::LiTimeCode> timecode;
     std::filesystem::path folder;  ///< Where files go; empty: none are written.
     bool isPaced = false;
@@ -32,6 +33,14 @@ struct HostContext {
     std::int64_t nbLoops = 1;  ///< 0: for ever.
 
     Pacer pacer;
+
+    // Memory, made for the first source that asks:
+    Orv::RCShdPtr<Orv::MbManager> getPictures(std::uint64_t unitBytes);
+    Orv::RCShdPtr<Orv::MbManager> getSounds();
+    Orv::MbManagerStatistics getCacheStatistics() const;
+
+    void notePicture();  ///< One was handed on.
+    double getFirstPictureSeconds() const { return _firstPictureSeconds.load(); }  ///< 0: none yet.
 
     /// The devices at the ends of streams, which have to end before the show is over.
     void expectEnd(const std::string& device);
@@ -47,6 +56,8 @@ struct HostContext {
 
 private:
     mutable Orv::LkMutex _mutex{"HostContext"};
+    Orv::RCShdPtr<Orv::MbManager> _pictures, _sounds;
+    std::atomic<double> _firstPictureSeconds{0};  // since the program's start
     Orv::LkSema _news{"HostContext news", 0};
     std::set<std::string> _awaited;
     bool _isAnyAwaited = false;

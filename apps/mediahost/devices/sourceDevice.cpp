@@ -70,15 +70,15 @@ void SourceDevice::addProperties() {
 
 void SourceDevice::addPictures(std::unique_ptr<UnitDecoder> decoder, const PictureFormat& format) {
     const std::uint64_t unitBytes = decoder->getUnitBytes();
-    if (unitBytes > getContext().pictureBytes) {
+    const Orv::RCShdPtr<Orv::MbManager> manager = getContext().getPictures(unitBytes);
+    if (unitBytes > getContext().cacheBytes) {
         throw MediaError("one picture takes " + std::to_string(unitBytes) +
                          " bytes, the cache has only " +
-                         std::to_string(getContext().pictureBytes) + "; give it more with --cache");
+                         std::to_string(getContext().cacheBytes) + "; give it more with --cache");
     }
     _pictureFormat = std::make_shared<const PictureFormat>(format);
-    _pictures = std::make_unique<Track>(getName() + " pictures", std::move(decoder),
-                                        getContext().pictures);
-    const auto nbFit = static_cast<std::int64_t>(getContext().pictureBytes / unitBytes);
+    _pictures = std::make_unique<Track>(getName() + " pictures", std::move(decoder), manager);
+    const auto nbFit = static_cast<std::int64_t>(getContext().cacheBytes / unitBytes);
     const std::int64_t nbAhead = std::clamp<std::int64_t>(
         (nbFit - NB_PICTURES_ON_THEIR_WAY) / 2, 0,
         getContext().isReverse ? MOST_PICTURES_AHEAD_REVERSE : MOST_PICTURES_AHEAD);
@@ -94,7 +94,8 @@ void SourceDevice::addPictures(std::unique_ptr<UnitDecoder> decoder, const Pictu
 
 void SourceDevice::addSound(std::unique_ptr<UnitDecoder> decoder, const SoundFormat& format) {
     _soundFormat = format;
-    _sound = std::make_unique<Track>(getName() + " sound", std::move(decoder), getContext().sounds);
+    _sound = std::make_unique<Track>(getName() + " sound", std::move(decoder),
+                                     getContext().getSounds());
     const std::string description = "sound/float;rate=" + std::to_string(format.rate) +
                                     ";channels=" + std::to_string(format.nbChannels);
     _soundLoop = addLoopSource("audio", description.c_str(), [this](Loop& loop) {
@@ -180,6 +181,7 @@ void SourceDevice::loadAhead(Track& track, std::int64_t unit, std::int64_t nbAhe
 bool SourceDevice::pushPicture(Loop& loop, Orv::MbBufferRdGuardImp guard, std::int64_t unit) {
     _position = unit;
     ++_nbShown;
+    getContext().notePicture();
     _positionProperty->notify(1);
     return loop.push(createElem(Orv::RCShdPtr<Orv::DevMDStreamBuf>(
         new PictureBuf(std::move(guard), _pictureFormat, unit))));

@@ -10,7 +10,7 @@ namespace {
 constexpr std::uint64_t HEADER_BYTES = 44;
 
 void append(std::vector<unsigned char>& bytes, const char* text) {
-    bytes.insert(bytes.end(), text, text + 4);
+    for (int i = 0; i < 4; ++i) bytes.push_back(static_cast<unsigned char>(text[i]));
 }
 void append(std::vector<unsigned char>& bytes, std::uint64_t number, int nbBytes) {
     for (int i = 0; i < nbBytes; ++i) {
@@ -31,6 +31,7 @@ std::vector<unsigned char> WaveFile::makeHeader() const {
     const auto nbChannels = static_cast<std::uint64_t>(_format.nbChannels);
     const auto rate = static_cast<std::uint64_t>(_format.rate);
     std::vector<unsigned char> bytes;
+    bytes.reserve(HEADER_BYTES);
     append(bytes, "RIFF");
     append(bytes, std::min(_nbBytes + HEADER_BYTES - 8, limit), 4);
     append(bytes, "WAVE");
