@@ -42,7 +42,7 @@ void DisplayDevice::take(const Orv::RCShdPtr<PictureBuf>& buf) {
 
 void DisplayDevice::keep(const PictureBuf& buf) {
     if (_thumbnails.size() == NB_KEPT) {
-        for (std::size_t i = 0; i < NB_SHOWN; ++i) _thumbnails[i] = std::move(_thumbnails[2 * i]);
+        for (std::size_t i = 1; i < NB_SHOWN; ++i) _thumbnails[i] = std::move(_thumbnails[2 * i]);
         _thumbnails.resize(NB_SHOWN);
         _stride *= 2;
         if (_nbPictures % _stride != 0) return;

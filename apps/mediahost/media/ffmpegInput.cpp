@@ -2,6 +2,10 @@
 
 #include "mediaError.h"
 
+extern "C" {
+#include <libavutil/log.h>
+}
+
 namespace MediaHost {
 
 namespace {
@@ -11,6 +15,7 @@ const char* nameOf(AVMediaType type) {
 }
 
 FfmpegFormat openFile(const std::string& path) {
+    av_log_set_level(AV_LOG_FATAL);  // damaged pieces are counted and reported
     AVFormatContext* opened = nullptr;
     int code = avformat_open_input(&opened, path.c_str(), nullptr, nullptr);
     if (code < 0) {

@@ -72,10 +72,7 @@ bool FfmpegPictures::next() {
 bool FfmpegPictures::advance() {
     _frame = _input.read();
     if (_frame == nullptr) {
-        if (_isLocating) {
-            restart(0);
-            return advance();
-        }
+        if (_isLocating) return seekEarlier();
         if (!_isComplete) _isComplete = _nextUnit == static_cast<std::int64_t>(_known.size());
         return false;
     }
@@ -90,7 +87,9 @@ bool FfmpegPictures::recall(const Known& seen) {
             std::lower_bound(_known.begin(), _known.end(), seen.timestamp,
                              [](const Known& known, std::int64_t at) { return known.timestamp < at; });
         if (found == _known.end() || found->timestamp != seen.timestamp) return false;
-        _nextUnit = found - _known.begin();
+        const std::int64_t unit = found - _known.begin();
+        if (unit > _wantedUnit) return seekEarlier();
+        _nextUnit = unit;
         _isLocating = false;
     }
     if (_nextUnit == static_cast<std::int64_t>(_known.size())) {
@@ -108,6 +107,13 @@ bool FfmpegPictures::recall(const Known& seen) {
     }
     _unit = _nextUnit++;
     return true;
+}
+
+// Some formats are sought by a guess, and this one was too late.
+bool FfmpegPictures::seekEarlier() {
+    _nbUnitsBefore = _nbUnitsBefore * 2 + 8;
+    seek(_wantedUnit);
+    return advance();
 }
 
 void FfmpegPictures::restart(std::int64_t unit) {
@@ -155,11 +161,12 @@ std::int64_t FfmpegPictures::findKey(std::int64_t unit) const {
 }
 
 bool FfmpegPictures::isSeekQuicker(std::int64_t unit) const {
-    return _isSeekable && findKey(unit) > _nextUnit;
+    return _isSeekable && findKey(unit - _nbUnitsBefore) > _nextUnit;
 }
 
 void FfmpegPictures::seek(std::int64_t unit) {
-    const std::int64_t key = findKey(unit);
+    const std::int64_t key = findKey(unit - _nbUnitsBefore);
+    _wantedUnit = unit;
     if (key > 0 && _isSeekable &&
         _input.seek(_known[static_cast<std::size_t>(key)].timestamp)) {
         _isLocating = true;

@@ -52,6 +52,8 @@ private:
     bool _isComplete = false;    // _known is
     bool _isSeekable = true;     // as far as is known
     bool _isLocating = false;    // after a seek, until it is clear which picture has come
+    std::int64_t _wantedUnit = 0;     // of the latest seek
+    std::int64_t _nbUnitsBefore = 0;  // so much earlier is sought
     std::int64_t _unit = -1;
     std::int64_t _nextUnit = 0;
     std::uint64_t _nbScaled = 0;
@@ -62,6 +64,7 @@ private:
     bool advance();
     bool recall(const Known& seen);
     std::int64_t findKey(std::int64_t unit) const;
+    bool seekEarlier();
     void restart(std::int64_t unit);
 };
 

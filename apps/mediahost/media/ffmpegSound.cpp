@@ -88,8 +88,9 @@ bool FfmpegSound::locate(std::int64_t timestamp) {
     }
     const bool isPast = found == _known.end() || found->sample > _wantedSample;
     if (isPast) {
-        _isSeekable = false;
-        restart();
+        // Some formats are sought by a guess, and this one was too late.
+        _nbSettling *= 2;
+        seek(_nextUnit);
     }
     return false;
 }
@@ -144,7 +145,7 @@ void FfmpegSound::seek(std::int64_t unit) {
     const auto at = std::upper_bound(
         _known.begin(), _known.end(), _wantedSample,
         [](std::int64_t sample, const Known& known) { return sample < known.sample; });
-    const std::ptrdiff_t piece = at - _known.begin() - 1 - NB_SETTLING;
+    const std::ptrdiff_t piece = at - _known.begin() - 1 - _nbSettling;
     if (_isSeekable && piece > 0 &&
         _input.seek(_known[static_cast<std::size_t>(piece)].timestamp)) {
         _isLocating = true;

@@ -38,8 +38,6 @@ private:
         std::int64_t timestamp;
         std::int64_t sample;  // the first one
     };
-    static constexpr int NB_SETTLING = 8;  // pieces decoded before those that are used
-
     FfmpegInput _input;
     SoundFormat _format;
     SwrContext* _converter = nullptr;
@@ -49,6 +47,7 @@ private:
     bool _isSeekable = true;
     std::int64_t _nbSamples = 0;   // of the track, once complete
     std::int64_t _nextSample = 0;  // the first one of the next piece
+    std::int64_t _nbSettling = 8;  // pieces decoded before those that are used
     bool _isLocating = false;
     std::int64_t _wantedSample = 0;   // what comes earlier is dropped
     std::vector<float> _waiting;      // decoded, from _nextUnit on

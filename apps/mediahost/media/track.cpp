@@ -206,13 +206,15 @@ std::optional<std::int64_t> Track::choosePlace() {
                                [](const auto& entry) { return entry.second.isUrgent; });
     if (wanted == _requests.end()) wanted = _requests.lower_bound(here);
     if (wanted == _requests.end()) wanted = _requests.begin();
-    if (wanted->first >= here && !_decoder->isSeekQuicker(wanted->first)) return std::nullopt;
-    // Neighbours before it are taken on the way.
-    while (wanted != _requests.begin() &&
-           wanted->first - std::prev(wanted)->first <= NEAR) {
+    const auto isAhead = [&] {
+        return wanted->first >= here && !_decoder->isSeekQuicker(wanted->first);
+    };
+    if (isAhead()) return std::nullopt;
+    // Neighbours before it are taken on the way, which may be the way that it is on already.
+    while (wanted != _requests.begin() && wanted->first - std::prev(wanted)->first <= NEAR) {
         --wanted;
+        if (isAhead()) return std::nullopt;
     }
-    if (wanted->first == here) return std::nullopt;
     return wanted->first;
 }
 
@@ -244,7 +246,8 @@ void Track::finishAll(std::exception_ptr error) {
 
 void Track::noteProgress() {
     _nbDecoded = _decoder->getNbDecoded();
-    _nbFaults = _decoder->getNbFaults();
+    // Once all of it was seen, faults come again.
+    if (_nbUnits.load() == UNKNOWN) _nbFaults = _decoder->getNbFaults();
 }
 
 }  // namespace MediaHost
