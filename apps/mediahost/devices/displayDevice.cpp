@@ -76,9 +76,9 @@ void DisplayDevice::drawSheet() const {
     writePng(getContext().folder / "contact-sheet.png", view);
 }
 
-void DisplayDevice::finish() {
+void DisplayDevice::finish(bool isWhole) {
     _through->push(createNews(Elem::END));
-    if (!_thumbnails.empty()) drawSheet();
+    if (isWhole && !_thumbnails.empty()) drawSheet();
 }
 
 void DisplayDevice::close() {

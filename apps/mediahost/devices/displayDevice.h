@@ -20,7 +20,7 @@ public:
 
 protected:
     void open() override;
-    void finish() override;
+    void finish(bool isWhole) override;
     void close() override;
 
 private:

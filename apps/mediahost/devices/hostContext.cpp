@@ -72,6 +72,16 @@ bool HostContext::hasEnded() const {
     return _failure || (_isAnyAwaited && _awaited.empty());
 }
 
+bool HostContext::isEndExpected() const {
+    const Orv::LkGuard guard(_mutex);
+    return _isAnyAwaited;
+}
+
+bool HostContext::hasFailed() const {
+    const Orv::LkGuard guard(_mutex);
+    return _failure != nullptr;
+}
+
 void HostContext::reportFailure(const std::string& device, std::exception_ptr error) {
     try {
         try {

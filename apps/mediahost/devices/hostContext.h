@@ -46,9 +46,11 @@ struct HostContext {
     void expectEnd(const std::string& device);
     void reportEnd(const std::string& device);
     bool hasEnded() const;
+    bool isEndExpected() const;  ///< Of any device.
 
     /// The first failure counts; the show is over with it.
     void reportFailure(const std::string& device, std::exception_ptr error);
+    bool hasFailed() const;
     void rethrowFailure() const;
 
     /// Waits until something is reported, or the time is over.

@@ -44,22 +44,22 @@ void MediaDevice::take(std::size_t input, Orv::ObjPtr<Elem> elem,
         if (elem->isTerminal()) {
             _inputs[input].hasEnded = true;
             inputEnded(input);
-            if (!isAnyInputOpen()) finishOnce();
+            if (!isAnyInputOpen()) finishOnce(!_context.hasFailed());
         } else if (elem->getEv() == Elem::DATA && !_isFinished) {
             work(elem->getBuf());
         }
     } catch (...) {
-        _isFinished = true;
         _context.reportFailure(_text, std::current_exception());
+        finishOnce(false);
     }
 }
 
-void MediaDevice::finishOnce() {
+void MediaDevice::finishOnce(bool isWhole) {
     if (!_isFinished) {
         _isFinished = true;
-        finish();
+        finish(isWhole);
     }
-    _stopping.done();
+    if (!isAnyInputOpen()) _stopping.done();
     _context.reportEnd(_text);
 }
 
@@ -74,14 +74,19 @@ void MediaDevice::stop(Orv::DevMDSyncSeqRequest& request) {
         _stopping = request.postpone();
         return;
     }
-    finishOnce();
+    try {
+        finishOnce(!_context.hasFailed());
+    } catch (...) {
+        _context.reportFailure(_text, std::current_exception());
+    }
 }
 
+// A show that was given up leaves nothing half done that looks whole.
 void MediaDevice::abort(Orv::DevMDSyncSeqRequest&) {
-    finishOnce();
+    finishOnce(false);
+    _stopping.done();
 }
 
-// A show that was given up leaves nothing half done that looks whole: finish() is not called.
 void MediaDevice::close() {
     _stopping = Orv::DevMDSyncSeqDone();
 }

@@ -45,7 +45,10 @@ protected:
     Orv::RCShdPtr<Source> addOutput(const Orv::LiString& name, const Orv::LiString& description);
 
     virtual void inputEnded(std::size_t /*input*/) {}  ///< In order of addition.
-    virtual void finish() {}  ///< Everything has come in, or nothing more will; called once.
+
+    /// Nothing more comes in; called once. Ends what goes out.
+    /// @param isWhole  all that was to come has come: files are finished; else they are left away.
+    virtual void finish(bool /*isWhole*/) {}
 
     bool isInputOpen(std::size_t input) const;  ///< Something may still come.
 
@@ -69,7 +72,7 @@ private:
     void take(std::size_t input, Orv::ObjPtr<Elem> elem,
               const std::function<void(const Orv::RCShdPtr<Orv::DevMDStreamBuf>&)>& work);
     bool isAnyInputOpen() const;
-    void finishOnce();
+    void finishOnce(bool isWhole);
 };
 
 template <class Buf, class Take>

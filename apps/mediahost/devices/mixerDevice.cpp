@@ -134,7 +134,7 @@ void MixerDevice::notifyMeters(std::size_t nbSamples) {
     show(_master);
 }
 
-void MixerDevice::finish() {
+void MixerDevice::finish(bool) {
     _out->push(createNews(Elem::END));
 }
 

@@ -19,7 +19,7 @@ public:
 
 protected:
     void inputEnded(std::size_t input) override;
-    void finish() override;
+    void finish(bool isWhole) override;
 
 private:
     using Peaks = Orv::Vector<float>;

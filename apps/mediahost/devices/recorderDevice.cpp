@@ -58,7 +58,12 @@ void RecorderDevice::writeChecksum(const PictureBuf& buf) {
                       getChecksum(buf.getData(), buf.getFormat().nbBytes) + '\n');
 }
 
-void RecorderDevice::finish() {
+void RecorderDevice::finish(bool isWhole) {
+    if (!isWhole) {
+        _sound.reset();
+        _checksums.reset();
+        return;
+    }
     if (_sound) _sound->commit();
     if (_checksums) _checksums->commit();
 }

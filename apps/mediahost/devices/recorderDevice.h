@@ -21,7 +21,7 @@ public:
     RecorderDevice(const Orv::LiString& name, HostContext& context, Settings settings);
 
 protected:
-    void finish() override;
+    void finish(bool isWhole) override;
     void close() override;
 
 private:

@@ -100,9 +100,9 @@ void ScopeDevice::draw() const {
     writePng(getContext().folder / "waveform.png", view);
 }
 
-void ScopeDevice::finish() {
+void ScopeDevice::finish(bool isWhole) {
     _through->push(createNews(Elem::END));
-    if (!getContext().folder.empty() && _nbSamples > 0) draw();
+    if (isWhole && !getContext().folder.empty() && _nbSamples > 0) draw();
 }
 
 }  // namespace MediaHost

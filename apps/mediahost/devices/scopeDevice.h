@@ -12,7 +12,7 @@ public:
     ScopeDevice(const Orv::LiString& name, HostContext& context, Settings settings);
 
 protected:
-    void finish() override;
+    void finish(bool isWhole) override;
 
 private:
     struct Extent {

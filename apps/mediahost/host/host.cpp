@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <iostream>
 
+#include <orv/devMgrEx.h>
 #include <orv/devMgrPropertyObserverUtil.h>
 #include <orv/devRegistry.h>
 #include <orv/devRegistryDeviceEntry.h>
@@ -291,10 +292,30 @@ bool Host::play() {
     return isWhole;
 }
 
+// As the sequence's, with the devices that have failed named in the error.
+bool Host::waitFor(const char* state, double seconds) {
+    try {
+        return _sequence->waitFor(state, seconds);
+    } catch (const Orv::DevMgrEx::SMExecutionError&) {
+        _context.rethrowFailure();  // a device's own words are better
+        std::string failures = "the sequence \"" + _tree + "\" has failed";
+        for (const Pipeline::Device& device : _pipeline.devices) {
+            if (_tree.find(device.name) == std::string::npos) continue;
+            const Orv::LiString failure = _sequence->getFailure(device.name.c_str());
+            if (!failure.isEmpty()) failures += "; " + device.name + ": " + failure.getChars();
+        }
+        throwBecause(failures);
+    }
+}
+
 bool Host::waitInStep() {
-    while (!_sequence->waitFor("lock", 0.05)) {
+    while (!waitFor("lock", 0.05)) {
         _context.rethrowFailure();
         if (Process::isInterrupted()) return false;
+    }
+    if (!_context.isEndExpected()) {
+        throw MediaError("no stream leads to a device of the sequence \"" + _tree +
+                         "\": nothing would ever end");
     }
     return true;
 }
@@ -311,9 +332,9 @@ bool Host::waitForEnd() {
 
 void Host::stop() {
     _sequence->stop();
-    if (_sequence->waitFor("final", STOP_SECONDS)) return;
+    if (waitFor("final", STOP_SECONDS)) return;
     _sequence->abort();
-    if (!_sequence->waitFor("final", STOP_SECONDS)) {
+    if (!waitFor("final", STOP_SECONDS)) {
         throw MediaError("the devices do not stop; " + _tree + " was given up");
     }
 }

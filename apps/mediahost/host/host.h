@@ -74,6 +74,7 @@ private:
     void noteRate();
     void connectStandard();
     std::string makeTree() const;
+    bool waitFor(const char* state, double seconds);
     bool waitInStep();
     bool waitForEnd();
     void stop();
