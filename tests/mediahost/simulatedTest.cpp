@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdio>
 #include <set>
@@ -176,7 +177,7 @@ TEST(MediaHost, tellsWhatIsWrongWithWhatItIsAskedFor) {
         {"get mixer:gain:", "cannot get the property \"mixer:gain:\""},
         {"set display:shown=1", "\"set\" is not available for property shown"},
         {"run missing.pipeline", "cannot open the pipeline \"missing.pipeline\""},
-        {"dance", "dance"},
+        {"dance", "subcommand is required"},
         {"play", "input is required"},
     };
     for (const Row& row : rows) {
@@ -231,7 +232,7 @@ TEST(MediaHost, playsWhatATextFileDescribes) {
         for (std::size_t i = first * 2; i < end * 2; ++i) highest = std::max<int>(highest, wave.samples[i]);
         return highest;
     };
-    EXPECT_NEAR(findHighest(1000, 23000), 0.275 * 32768, 60);   // both
+    EXPECT_NEAR(findHighest(1000, 23000), 0.270 * 32768, 160);  // both; their crests do not meet
     EXPECT_NEAR(findHighest(25000, 47000), 0.025 * 32768, 4);   // the one that is left
     EXPECT_THAT(runHost("graph " + path).output, HasSubstr("\"desk\" -> \"high\" [style=dashed"));
 }

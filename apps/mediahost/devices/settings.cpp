@@ -1,7 +1,7 @@
 #include "settings.h"
 
 #include <charconv>
-#include <cmath>
+#include <cstdio>
 
 #include "mediaError.h"
 
@@ -15,8 +15,9 @@ namespace {
 }
 
 std::string shorten(double value) {
-    const std::string text = std::to_string(value);
-    return text.substr(0, text.find_last_not_of("0") + (text.find_last_not_of("0.") != std::string::npos));
+    char text[32];
+    std::snprintf(text, sizeof text, "%.15g", value);
+    return text;
 }
 
 }  // namespace
