@@ -11,20 +11,21 @@ bool ReaderDevice::isAvailable() {
 }
 
 void ReaderDevice::openFile() {
-    const bool hasPictures = FfmpegInput::hasStream(_file, AVMEDIA_TYPE_VIDEO);
-    const bool hasSound = FfmpegInput::hasStream(_file, AVMEDIA_TYPE_AUDIO);
-    if (!hasPictures && !hasSound) {
+    auto pictures =
+        FfmpegInput::tryOpen(_file, AVMEDIA_TYPE_VIDEO, static_cast<int>(_nbThreads));
+    auto sound = FfmpegInput::tryOpen(_file, AVMEDIA_TYPE_AUDIO, 1);
+    if (!pictures && !sound) {
         throw MediaError('"' + _file + "\" has neither pictures nor sound");
     }
-    if (hasPictures) {
-        auto decoder = std::make_unique<FfmpegPictures>(_file, static_cast<int>(_nbThreads));
+    if (pictures) {
+        auto decoder = std::make_unique<FfmpegPictures>(std::move(pictures));
         const PictureFormat format = decoder->getFormat();
         _seconds = decoder->getSeconds();
         _codecs = decoder->getCodecName();
         addPictures(std::move(decoder), format);
     }
-    if (hasSound) {
-        auto decoder = std::make_unique<FfmpegSound>(_file);
+    if (sound) {
+        auto decoder = std::make_unique<FfmpegSound>(std::move(sound));
         const SoundFormat format = decoder->getFormat();
         _seconds = std::max(_seconds, decoder->getSeconds());
         _codecs += (_codecs.empty() ? "" : ", ") + decoder->getCodecName();

@@ -42,21 +42,22 @@ FfmpegInput::FfmpegInput(const std::string& path, AVMediaType type, int nbThread
       _type(type),
       _nbThreads(nbThreads),
       _frame(av_frame_alloc()),
-      _packet(av_packet_alloc()) {
-    open();
+      _packet(av_packet_alloc()) {}
+
+std::unique_ptr<FfmpegInput> FfmpegInput::tryOpen(const std::string& path, AVMediaType type,
+                                                  int nbThreads) {
+    std::unique_ptr<FfmpegInput> input(new FfmpegInput(path, type, nbThreads));
+    if (!input->open()) input.reset();
+    return input;
 }
 
-bool FfmpegInput::hasStream(const std::string& path, AVMediaType type) {
-    const FfmpegFormat format = openFile(path);
-    const int stream = av_find_best_stream(format.get(), type, -1, -1, nullptr, 0);
-    return stream >= 0 && (format->streams[stream]->disposition & AV_DISPOSITION_ATTACHED_PIC) == 0;
-}
-
-void FfmpegInput::open() {
+// Returns false if there is no such stream. The cover of an album is no picture to be played.
+bool FfmpegInput::open() {
     _codec.reset();
     _format = openFile(_path);
     const AVCodec* decoder = nullptr;
     const int number = av_find_best_stream(_format.get(), _type, -1, -1, &decoder, 0);
+    if (number == AVERROR_STREAM_NOT_FOUND) return false;
     if (number < 0 || decoder == nullptr) {
         throw MediaError('"' + _path + "\" has no " + nameOf(_type) + " that can be decoded");
     }
@@ -64,6 +65,7 @@ void FfmpegInput::open() {
         if (i != static_cast<unsigned>(number)) _format->streams[i]->discard = AVDISCARD_ALL;
     }
     _stream = _format->streams[number];
+    if ((_stream->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0) return false;
     _codec.reset(avcodec_alloc_context3(decoder));
     avcodec_parameters_to_context(_codec.get(), _stream->codecpar);
     _codec->pkt_timebase = _stream->time_base;
@@ -74,6 +76,7 @@ void FfmpegInput::open() {
                          "\" (" + decoder->name + "): " + describeFfmpegError(code));
     }
     _isDraining = false;
+    return true;
 }
 
 AVFrame* FfmpegInput::read() {
@@ -118,7 +121,7 @@ bool FfmpegInput::seek(std::int64_t timestamp) {
 
 // Opened again rather than sought: then everything is as it was the first time, for every format.
 void FfmpegInput::rewind() {
-    open();
+    if (!open()) throw MediaError("\"" + _path + "\" has changed");
 }
 
 double FfmpegInput::toSeconds(std::int64_t timestamp) const {

@@ -28,12 +28,12 @@ std::string describeFfmpegError(int code);
 /// - Threads: one at a time; decoding itself uses @p nbThreads.
 class FfmpegInput {
 public:
+
+    /// An input for a stream of that kind, or null if the file has none.
     /// @param nbThreads  0: as many as the machine has processors.
     /// @throws MediaError if the file cannot be opened, is no media, or cannot be decoded.
-    FfmpegInput(const std::string& path, AVMediaType type, int nbThreads);
-
-    /// Whether the file has a stream of that kind.
-    static bool hasStream(const std::string& path, AVMediaType type);
+    static std::unique_ptr<FfmpegInput> tryOpen(const std::string& path, AVMediaType type,
+                                                int nbThreads);
 
     /// Decodes the next frame, leaving out what is damaged.
     /// @return null at the end; else borrowed until the next call.
@@ -61,7 +61,8 @@ private:
     bool _isDraining = false;
     std::uint64_t _nbFaults = 0;
 
-    void open();
+    FfmpegInput(const std::string& path, AVMediaType type, int nbThreads);
+    bool open();
     bool feed();
 };
 

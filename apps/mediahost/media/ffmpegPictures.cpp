@@ -34,8 +34,7 @@ std::uint64_t takePrint(const AVFrame& frame) {
 
 }  // namespace
 
-FfmpegPictures::FfmpegPictures(const std::string& path, int nbThreads)
-    : _input(path, AVMEDIA_TYPE_VIDEO, nbThreads) {
+FfmpegPictures::FfmpegPictures(std::unique_ptr<FfmpegInput> input) : _input(std::move(input)) {
     readFormat();
 }
 
@@ -44,7 +43,7 @@ FfmpegPictures::~FfmpegPictures() {
 }
 
 void FfmpegPictures::readFormat() {
-    const AVCodecContext& codec = _input.getCodec();
+    const AVCodecContext& codec = _input->getCodec();
     if (codec.width <= 0 || codec.height <= 0 || codec.pix_fmt == AV_PIX_FMT_NONE) {
         throw MediaError("the size of the pictures is unknown");
     }
@@ -55,8 +54,8 @@ void FfmpegPictures::readFormat() {
     const int nbBytes = av_image_get_buffer_size(codec.pix_fmt, codec.width, codec.height, 1);
     if (nbBytes <= 0) throw MediaError("pictures of this size cannot be kept");
     _format.nbBytes = static_cast<std::size_t>(nbBytes);
-    AVRational rate = _input.getStream().avg_frame_rate;
-    if (rate.num <= 0 || rate.den <= 0) rate = _input.getStream().r_frame_rate;
+    AVRational rate = _input->getStream().avg_frame_rate;
+    if (rate.num <= 0 || rate.den <= 0) rate = _input->getStream().r_frame_rate;
     if (rate.num <= 0 || rate.den <= 0) rate = {25, 1};
     _format.rate = Orv::Rational(rate.num, rate.den);
 }
@@ -70,7 +69,7 @@ bool FfmpegPictures::next() {
 
 // Decodes one picture. Returns false if there is none, or if it is not clear which one it is.
 bool FfmpegPictures::advance() {
-    _frame = _input.read();
+    _frame = _input->read();
     if (_frame == nullptr) {
         if (_isLocating) return seekEarlier();
         if (!_isComplete) _isComplete = _nextUnit == static_cast<std::int64_t>(_known.size());
@@ -117,7 +116,7 @@ bool FfmpegPictures::seekEarlier() {
 }
 
 void FfmpegPictures::restart(std::int64_t unit) {
-    _input.rewind();
+    _input->rewind();
     _frame = nullptr;
     _isLocating = false;
     _nextUnit = unit;
@@ -132,7 +131,7 @@ void FfmpegPictures::copy(void* unit) {
     auto* header = static_cast<UnitHeader*>(unit);
     const Known& known = _known[static_cast<std::size_t>(_unit)];
     const bool isTimed = known.timestamp != AV_NOPTS_VALUE && _known[0].timestamp != AV_NOPTS_VALUE;
-    header->seconds = isTimed ? _input.toSeconds(known.timestamp - _known[0].timestamp)
+    header->seconds = isTimed ? _input->toSeconds(known.timestamp - _known[0].timestamp)
                               : static_cast<double>(_unit) / _format.rate.toDouble();
     header->nbSamples = 0;
 
@@ -168,7 +167,7 @@ void FfmpegPictures::seek(std::int64_t unit) {
     const std::int64_t key = findKey(unit - _nbUnitsBefore);
     _wantedUnit = unit;
     if (key > 0 && _isSeekable &&
-        _input.seek(_known[static_cast<std::size_t>(key)].timestamp)) {
+        _input->seek(_known[static_cast<std::size_t>(key)].timestamp)) {
         _isLocating = true;
         _nextUnit = key;
     } else {

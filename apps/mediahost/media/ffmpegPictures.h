@@ -18,12 +18,12 @@ namespace MediaHost {
 /// differs, the file cannot be sought reliably, and is then read from the start instead.
 class FfmpegPictures : public UnitDecoder {
 public:
-    FfmpegPictures(const std::string& path, int nbThreads);
+    explicit FfmpegPictures(std::unique_ptr<FfmpegInput> input);
     ~FfmpegPictures() override;
 
     const PictureFormat& getFormat() const { return _format; }
-    std::string getCodecName() const { return _input.getCodec().codec->name; }
-    double getSeconds() const { return _input.getSeconds(); }
+    std::string getCodecName() const { return _input->getCodec().codec->name; }
+    double getSeconds() const { return _input->getSeconds(); }
     std::uint64_t getNbScaled() const { return _nbScaled; }
 
     std::size_t getUnitBytes() const override { return sizeof(UnitHeader) + _format.nbBytes; }
@@ -34,7 +34,7 @@ public:
     void seek(std::int64_t unit) override;
     bool isSeekQuicker(std::int64_t unit) const override;
     std::optional<std::int64_t> getNbUnits() const override;
-    std::uint64_t getNbFaults() const override { return _input.getNbFaults(); }
+    std::uint64_t getNbFaults() const override { return _input->getNbFaults(); }
     std::uint64_t getNbDecoded() const override { return _nbDecoded; }
 
 private:
@@ -44,7 +44,7 @@ private:
         bool isKey;
     };
 
-    FfmpegInput _input;
+    const std::unique_ptr<FfmpegInput> _input;
     PictureFormat _format;
     SwsContext* _scaler = nullptr;
     AVFrame* _frame = nullptr;  // the input's, or null

@@ -12,8 +12,8 @@ extern "C" {
 
 namespace MediaHost {
 
-FfmpegSound::FfmpegSound(const std::string& path) : _input(path, AVMEDIA_TYPE_AUDIO, 1) {
-    const AVCodecContext& codec = _input.getCodec();
+FfmpegSound::FfmpegSound(std::unique_ptr<FfmpegInput> input) : _input(std::move(input)) {
+    const AVCodecContext& codec = _input->getCodec();
     if (codec.sample_rate <= 0 || codec.ch_layout.nb_channels <= 0) {
         throw MediaError("rate or channels of the sound are unknown");
     }
@@ -46,7 +46,7 @@ bool FfmpegSound::next() {
 
 // Decodes one piece and adds what is wanted of it to _waiting. Returns false at the end.
 bool FfmpegSound::decodePiece() {
-    const AVFrame* frame = _input.read();
+    const AVFrame* frame = _input->read();
     if (frame == nullptr) {
         if (_isLocating) {
             restart();
@@ -147,7 +147,7 @@ void FfmpegSound::seek(std::int64_t unit) {
         [](std::int64_t sample, const Known& known) { return sample < known.sample; });
     const std::ptrdiff_t piece = at - _known.begin() - 1 - _nbSettling;
     if (_isSeekable && piece > 0 &&
-        _input.seek(_known[static_cast<std::size_t>(piece)].timestamp)) {
+        _input->seek(_known[static_cast<std::size_t>(piece)].timestamp)) {
         _isLocating = true;
     } else {
         restart();
@@ -155,7 +155,7 @@ void FfmpegSound::seek(std::int64_t unit) {
 }
 
 void FfmpegSound::restart() {
-    _input.rewind();
+    _input->rewind();
     _isLocating = false;
     _nextSample = 0;
 }

@@ -15,12 +15,12 @@ namespace MediaHost {
 /// depends on those before it.
 class FfmpegSound : public UnitDecoder {
 public:
-    explicit FfmpegSound(const std::string& path);
+    explicit FfmpegSound(std::unique_ptr<FfmpegInput> input);
     ~FfmpegSound() override;
 
     const SoundFormat& getFormat() const { return _format; }
-    std::string getCodecName() const { return _input.getCodec().codec->name; }
-    double getSeconds() const { return _input.getSeconds(); }
+    std::string getCodecName() const { return _input->getCodec().codec->name; }
+    double getSeconds() const { return _input->getSeconds(); }
 
     std::size_t getUnitBytes() const override;
     bool next() override;
@@ -30,7 +30,7 @@ public:
     void seek(std::int64_t unit) override;
     bool isSeekQuicker(std::int64_t unit) const override;
     std::optional<std::int64_t> getNbUnits() const override;
-    std::uint64_t getNbFaults() const override { return _input.getNbFaults(); }
+    std::uint64_t getNbFaults() const override { return _input->getNbFaults(); }
     std::uint64_t getNbDecoded() const override { return _nbDecoded; }
 
 private:
@@ -38,7 +38,7 @@ private:
         std::int64_t timestamp;
         std::int64_t sample;  // the first one
     };
-    FfmpegInput _input;
+    const std::unique_ptr<FfmpegInput> _input;
     SoundFormat _format;
     SwrContext* _converter = nullptr;
     int _sourceRate = 0, _sourceChannels = 0, _sourceSamples = -1;  // what _converter takes
