@@ -3,7 +3,6 @@
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
-
 #include <orv/lgChromeSink.h>
 #include <orv/lgRegistry.h>
 
@@ -21,7 +20,8 @@ enum ExitCode { PLAYED = 0, FAILED = 1, PLAYED_WITH_FAULTS = 2, INTERRUPTED = 13
 struct Options {
     std::string input;
     std::vector<std::string> names;  // of devices or properties, or assignments
-    std::string folder, rate = "fast", loops = "1", cache = "64M", strategy = "lru", timecode = "pal", trace;
+    std::string folder, rate = "fast", loops = "1", cache = "64M", strategy = "lru",
+                        timecode = "pal", trace;
     std::vector<std::string> sets, watches;
     std::int64_t nbThreads = 0;
     bool isReverse = false, hasFrames = false, hasChecksums = false, hasWindow = false;
@@ -70,15 +70,20 @@ void takeOptions(Pipeline& pipeline, const Options& options) {
         }
     };
     asked("--cache", [&](const std::string& text) { pipeline.setCache(text); }, options.cache);
-    asked("--strategy", [&](const std::string& text) { pipeline.setStrategy(text); }, options.strategy);
-    asked("--timecode", [&](const std::string& text) { pipeline.setTimecode(text); }, options.timecode);
+    asked(
+        "--strategy", [&](const std::string& text) { pipeline.setStrategy(text); },
+        options.strategy);
+    asked(
+        "--timecode", [&](const std::string& text) { pipeline.setTimecode(text); },
+        options.timecode);
     asked("--rate", [&](const std::string& text) { pipeline.setRate(text); }, options.rate);
     asked("--loops", [&](const std::string& text) { pipeline.setLoops(text); }, options.loops);
     pipeline.isReverse = options.isReverse;
     pipeline.folder = options.folder;
     pipeline.trace = options.trace;
     for (const std::string& set : options.sets) pipeline.sets.push_back({set, "--set " + set});
-    for (const std::string& name : options.watches) pipeline.watches.push_back({name, "--watch " + name});
+    for (const std::string& name : options.watches)
+        pipeline.watches.push_back({name, "--watch " + name});
 }
 
 /// The pipeline of play: source, mixer, scope, display, recorder and clock.
@@ -149,7 +154,8 @@ Pipeline makeBench(const Options& options) {
     Settings reader;
     if (!options.input.empty()) reader.set("file", options.input);
     for (const DeviceKind& kind : listKinds()) {
-        pipeline.addDevice(kind.name, kind.name, kind.name == std::string("reader") ? reader : Settings());
+        pipeline.addDevice(kind.name, kind.name,
+                           kind.name == std::string("reader") ? reader : Settings());
     }
     return pipeline;
 }
@@ -193,7 +199,8 @@ bool isPipelineFile(const std::string& path) {
 }
 
 int graph(const Options& options) {
-    Host host(isPipelineFile(options.input) ? Pipeline::read(options.input) : makePipeline(options));
+    Host host(isPipelineFile(options.input) ? Pipeline::read(options.input)
+                                            : makePipeline(options));
     host.open();
     host.connect();
     writeGraph(host, std::cout);
@@ -205,11 +212,14 @@ void addShowOptions(CLI::App& command, Options& options) {
     command.add_flag("--reverse", options.isReverse, "play backwards");
     command.add_option("--loops", options.loops, "how often to play; 0: for ever");
     command.add_option("--cache", options.cache, "memory for pictures: 64M, 1G, 10frames");
-    command.add_option("--strategy", options.strategy, "what gives way in the cache: lru or random");
+    command.add_option("--strategy", options.strategy,
+                       "what gives way in the cache: lru or random");
     command.add_option("--timecode", options.timecode, "film24, pal, ntsc-nd or ntsc-df");
     command.add_option("--set", options.sets, "DEVICE:PROPERTY=VALUE before the start")->take_all();
-    command.add_option("--threads", options.nbThreads, "that decode pictures; 0: one per processor");
-    command.add_option("--trace", options.trace, "writes a timeline for chrome://tracing or Perfetto");
+    command.add_option("--threads", options.nbThreads,
+                       "that decode pictures; 0: one per processor");
+    command.add_option("--trace", options.trace,
+                       "writes a timeline for chrome://tracing or Perfetto");
     command.add_flag("--window", options.hasWindow, "shows the pictures in a window");
 }
 
@@ -226,7 +236,8 @@ int runCommand(int nbArguments, char** arguments) {
     command->add_option("--out", options.folder, "a folder for sound, contact sheet and report");
     command->add_flag("--frames", options.hasFrames, "writes each picture as PNG, too");
     command->add_flag("--checksums", options.hasChecksums, "writes the checksum of each picture");
-    command->add_option("--watch", options.watches, "DEVICE:PROPERTY, printed when it changes")->take_all();
+    command->add_option("--watch", options.watches, "DEVICE:PROPERTY, printed when it changes")
+        ->take_all();
     addShowOptions(*command, options);
     command->callback([&] { code = play(makePipeline(options)); });
 
@@ -255,7 +266,8 @@ int runCommand(int nbArguments, char** arguments) {
     command->callback([&] { code = watch(options); });
 
     command = app.add_subcommand("graph", "prints devices, streams and sequence for Graphviz");
-    command->add_option("input", options.input, "as for play, or a pipeline file (.pipeline)")->required();
+    command->add_option("input", options.input, "as for play, or a pipeline file (.pipeline)")
+        ->required();
     command->callback([&] { code = graph(options); });
 
     command = app.add_subcommand("run", "plays what a text file describes");

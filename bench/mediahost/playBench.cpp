@@ -1,19 +1,18 @@
 // The media host beside ffmpeg: whole programs, from their start to their end, with as many threads.
 
 #include <benchmark/benchmark.h>
-#include <fcntl.h>
-#include <spawn.h>
-#include <sys/resource.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
 #include <chrono>
 #include <cstdlib>
+#include <fcntl.h>
 #include <filesystem>
 #include <fstream>
+#include <spawn.h>
 #include <sstream>
 #include <string>
+#include <sys/resource.h>
+#include <sys/wait.h>
 #include <thread>
+#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -69,14 +68,17 @@ void registerClip(const std::filesystem::path& clip) {
     const std::string name = "play " + clip.filename().string();
     const std::string threads = std::to_string(std::thread::hardware_concurrency());
     const auto add = [&](const char* library, const std::vector<std::string>& command) {
-        benchmark::RegisterBenchmark((name + '/' + library).c_str(),
-                                     [command](benchmark::State& state) { measure(state, command); })
+        benchmark::RegisterBenchmark(
+            (name + '/' + library).c_str(),
+            [command](benchmark::State& state) { measure(state, command); })
             ->UseManualTime()
             ->Iterations(1)
             ->Unit(benchmark::kMillisecond);
     };
-    add("orv-mediahost", {ORV_MEDIAHOST, "play", clip.string(), "--threads", threads, "--cache", "64M"});
-    add("ffmpeg", {"ffmpeg", "-nostdin", "-v", "error", "-threads", threads, "-i", clip.string(), "-f", "null", "-"});
+    add("orv-mediahost",
+        {ORV_MEDIAHOST, "play", clip.string(), "--threads", threads, "--cache", "64M"});
+    add("ffmpeg", {"ffmpeg", "-nostdin", "-v", "error", "-threads", threads, "-i", clip.string(),
+                   "-f", "null", "-"});
     benchmark::RegisterBenchmark((name + "/limit").c_str(),
                                  [](benchmark::State& state) {
                                      for (auto _ : state) state.SetIterationTime(1e-3);
@@ -93,10 +95,11 @@ double readAttribute(const std::string& text, const std::string& name) {
 
 // A minute of simulated 1080p60 with sound, in real time; the counters are what it took.
 void playPaced(benchmark::State& state) {
-    const std::filesystem::path folder = std::filesystem::temp_directory_path() / "orv-mediahost-bench";
+    const std::filesystem::path folder =
+        std::filesystem::temp_directory_path() / "orv-mediahost-bench";
     for (auto _ : state) {
-        const Run result = run({ORV_MEDIAHOST, "play", "simulated:1920x1080@60,60", "--rate", "realtime",
-                                "--out", folder.string()});
+        const Run result = run({ORV_MEDIAHOST, "play", "simulated:1920x1080@60,60", "--rate",
+                                "realtime", "--out", folder.string()});
         state.SetIterationTime(result.seconds);
         std::ostringstream report;
         report << std::ifstream(folder / "report.xml").rdbuf();
@@ -129,7 +132,10 @@ const bool isRegistered = [] {
     // Twice, since what is reported are medians.
     for (const auto& [name, function] : {std::pair{"paced 1080p60 60 s/orv-mediahost", playPaced},
                                          std::pair{"paced 1080p60 60 s/limit", showLimits}}) {
-        benchmark::RegisterBenchmark(name, function)->UseManualTime()->Iterations(1)->Repetitions(2);
+        benchmark::RegisterBenchmark(name, function)
+            ->UseManualTime()
+            ->Iterations(1)
+            ->Repetitions(2);
     }
     return true;
 }();

@@ -1,10 +1,9 @@
 // Real files: what comes out is what FFmpeg's own program decodes. The files are made by it; with
 // ORV_CLIPS naming a folder, those in there are played, too.
 
-#include <gtest/gtest.h>
-
 #include <cstdlib>
 #include <cstring>
+#include <gtest/gtest.h>
 #include <sstream>
 
 #include "hostProgram.h"
@@ -24,7 +23,8 @@ std::string quote(const std::string& path) {
 /// Decodes pictures, and gives their checksums in order.
 std::vector<std::string> decodePictures(const std::string& file) {
     std::istringstream lines(
-        runCommand(FFMPEG + ("-i " + quote(file)) + " -map 0:v -fps_mode passthrough -f framemd5 -").output);
+        runCommand(FFMPEG + ("-i " + quote(file)) + " -map 0:v -fps_mode passthrough -f framemd5 -")
+            .output);
     std::vector<std::string> checksums;
     for (std::string line; std::getline(lines, line);) {
         if (line[0] != '#') checksums.push_back(line.substr(line.rfind(' ') + 1));
@@ -108,7 +108,8 @@ TEST_F(MediaHostFiles, givesTheSamePicturesBackwardsInAnyBudget) {
         for (const char* cache : {"10frames", "40frames --strategy random", "1G"}) {
             SCOPED_TRACE(file + " --cache " + cache);
             const TestFolder out;
-            runHost("play " + quote(file) + " --reverse --checksums --cache " + cache + " --out " + out.getPath());
+            runHost("play " + quote(file) + " --reverse --checksums --cache " + cache + " --out " +
+                    out.getPath());
             EXPECT_EQ(getChecksums(out / "frames.txt"), expected);
         }
     }
@@ -127,10 +128,12 @@ TEST_F(MediaHostFiles, playsWithRoomForOnePicture) {
 
 TEST_F(MediaHostFiles, playsFilesWithoutSoundOrWithoutPictures) {
     const TestFolder silent, blind;
-    EXPECT_EQ(runHost("play " + get("silent.mp4") + " --checksums --out " + silent.getPath()).code, 0);
+    EXPECT_EQ(runHost("play " + get("silent.mp4") + " --checksums --out " + silent.getPath()).code,
+              0);
     EXPECT_EQ(getChecksums(silent / "frames.txt"), decodePictures(get("silent.mp4")));
     EXPECT_FALSE(std::filesystem::exists(silent / "sound.wav"));
-    EXPECT_EQ(runHost("play " + get("blind.m4a") + " --checksums --out " + blind.getPath()).code, 0);
+    EXPECT_EQ(runHost("play " + get("blind.m4a") + " --checksums --out " + blind.getPath()).code,
+              0);
     EXPECT_EQ(readWave(blind / "sound.wav").samples, decodeSound(get("blind.m4a")));
     EXPECT_FALSE(std::filesystem::exists(blind / "frames.txt"));
 }
@@ -142,9 +145,11 @@ TEST_F(MediaHostFiles, scalesPicturesWhereTheirSizeChangesOnTheWay) {
                    ":rate=25:duration=1 -c:v mpeg2video -f mpegts " + (folder / size));
     }
     writeFile(folder / "both.ts", readFile(folder / "160x120") + readFile(folder / "320x240"));
-    const HostRun run = runHost("play " + (folder / "both.ts") + " --checksums --out " + (folder / "out"));
+    const HostRun run =
+        runHost("play " + (folder / "both.ts") + " --checksums --out " + (folder / "out"));
     EXPECT_NE(run.code, 1) << run.output;
-    EXPECT_EQ(readFrames(folder / "out/frames.txt").size(), decodePictures(folder / "both.ts").size());
+    EXPECT_EQ(readFrames(folder / "out/frames.txt").size(),
+              decodePictures(folder / "both.ts").size());
 }
 
 TEST_F(MediaHostFiles, tellsOfFilesThatCannotBeRead) {
@@ -152,7 +157,8 @@ TEST_F(MediaHostFiles, tellsOfFilesThatCannotBeRead) {
     writeFile(folder / "text.mp4", std::string(5000, 'x'));
     writeFile(folder / "empty.mp4", "");
     const std::string whole = readFile(get("h264.mp4"));
-    writeFile(folder / "headless.mp4", whole.substr(0, whole.size() / 2));  // its table stood at the end
+    writeFile(folder / "headless.mp4",
+              whole.substr(0, whole.size() / 2));  // its table stood at the end
     for (const char* name : {"text.mp4", "empty.mp4", "headless.mp4", "missing.mp4"}) {
         const HostRun run = runHost("play " + (folder / name) + " --out " + (folder / "out"));
         EXPECT_EQ(run.code, 1) << name;
@@ -166,7 +172,8 @@ TEST_F(MediaHostFiles, playsWhatThereIsOfAFileThatWasCutOff) {
     const TestFolder folder;
     const std::string whole = readFile(get("open.mpeg"));
     writeFile(folder / "cut.mpeg", whole.substr(0, whole.size() / 2));
-    const HostRun run = runHost("play " + (folder / "cut.mpeg") + " --checksums --out " + (folder / "out"));
+    const HostRun run =
+        runHost("play " + (folder / "cut.mpeg") + " --checksums --out " + (folder / "out"));
     EXPECT_NE(run.code, 1) << run.output;
     const std::vector<std::string> all = decodePictures(get("open.mpeg"));
     const std::vector<std::string> played = getChecksums(folder / "out/frames.txt");
@@ -176,7 +183,8 @@ TEST_F(MediaHostFiles, playsWhatThereIsOfAFileThatWasCutOff) {
     readWave(folder / "out/sound.wav");
 
     // A file that says how long it is, and is not.
-    runCommand(FFMPEG + ("-i " + get("h264.mp4")) + " -c copy -movflags +faststart " + (folder / "fast.mp4"));
+    runCommand(FFMPEG + ("-i " + get("h264.mp4")) + " -c copy -movflags +faststart " +
+               (folder / "fast.mp4"));
     const std::string fast = readFile(folder / "fast.mp4");
     writeFile(folder / "cut.mp4", fast.substr(0, fast.size() / 2));
     const HostRun cut = runHost("play " + (folder / "cut.mp4"));
@@ -187,8 +195,9 @@ TEST_F(MediaHostFiles, playsWhatThereIsOfAFileThatWasCutOff) {
 TEST_F(MediaHostFiles, leavesNothingThatLooksWholeOnAFullDisk) {
     const TestFolder out;
     // The limit of a file's size stands for a disk that is full.
-    const HostRun run = runCommand("bash -c \"trap '' XFSZ; ulimit -f 100; exec ./orv-mediahost play " +
-                                   get("h264.mp4") + " --out " + out.getPath() + "\" 2>&1");
+    const HostRun run =
+        runCommand("bash -c \"trap '' XFSZ; ulimit -f 100; exec ./orv-mediahost play " +
+                   get("h264.mp4") + " --out " + out.getPath() + "\" 2>&1");
     EXPECT_EQ(run.code, 1) << run.output;
     EXPECT_THAT(run.output, HasSubstr("device \"recorder\" has failed"));
     EXPECT_THAT(run.output, HasSubstr("sound.wav\": "));

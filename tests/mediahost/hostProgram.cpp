@@ -1,12 +1,11 @@
 #include "hostProgram.h"
 
-#include <gtest/gtest.h>
-
 #include <algorithm>
 #include <atomic>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
+#include <gtest/gtest.h>
 #include <random>
 #include <sstream>
 
@@ -16,10 +15,14 @@ namespace {
 
 #ifdef _WIN32
 constexpr const char* PROGRAM = "orv-mediahost.exe ";
-int toCode(int status) { return status; }
+int toCode(int status) {
+    return status;
+}
 #else
 constexpr const char* PROGRAM = "./orv-mediahost ";
-int toCode(int status) { return status / 256; }
+int toCode(int status) {
+    return status / 256;
+}
 #endif
 
 std::uint32_t readNumber(const std::string& bytes, std::size_t at, int nbBytes) {
@@ -40,9 +43,9 @@ HostRun runCommand(const std::string& command) {
     const TestFolder folder;
     const std::string path = folder / "output.txt";
     const std::size_t errors = command.rfind(" 2>&1");
-    const std::string redirected =
-        errors == std::string::npos ? command + " >" + path
-                                    : command.substr(0, errors) + " >" + path + " 2>&1";
+    const std::string redirected = errors == std::string::npos
+                                       ? command + " >" + path
+                                       : command.substr(0, errors) + " >" + path + " 2>&1";
     const int code = toCode(std::system(redirected.c_str()));
     return {code, readFile(path)};
 }
@@ -84,14 +87,16 @@ std::vector<FrameLine> readFrames(const std::string& path) {
     std::ifstream file(path);
     std::vector<FrameLine> lines;
     FrameLine line;
-    while (file >> line.index >> line.number >> line.timecode >> line.checksum) lines.push_back(line);
+    while (file >> line.index >> line.number >> line.timecode >> line.checksum)
+        lines.push_back(line);
     return lines;
 }
 
 Wave readWave(const std::string& path) {
     const std::string bytes = readFile(path);
     Wave wave;
-    if (bytes.size() < 44 || bytes.compare(0, 4, "RIFF") != 0 || bytes.compare(36, 4, "data") != 0) {
+    if (bytes.size() < 44 || bytes.compare(0, 4, "RIFF") != 0 ||
+        bytes.compare(36, 4, "data") != 0) {
         ADD_FAILURE() << path << " is no WAV file";
         return wave;
     }

@@ -1,8 +1,7 @@
 // Ctrl-C, whenever it comes: the sequence stops in order, and what there is becomes whole.
 
-#include <gtest/gtest.h>
-
 #include <fcntl.h>
+#include <gtest/gtest.h>
 #include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -60,8 +59,10 @@ private:
 
 TEST(MediaHostInterrupt, finishesTheFilesOfAShowThatIsOn) {
     const TestFolder out;
-    Host host({"play", "simulated:320x180@25,3600", "--rate", "realtime", "--checksums", "--out", out.getPath()});
-    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); })) << host.getOutput();
+    Host host({"play", "simulated:320x180@25,3600", "--rate", "realtime", "--checksums", "--out",
+               out.getPath()});
+    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); }))
+        << host.getOutput();
     host.interrupt();
     EXPECT_EQ(host.join(), 130) << host.getOutput();
     EXPECT_THAT(host.getOutput(), HasSubstr("interrupted after"));
@@ -77,7 +78,8 @@ TEST(MediaHostInterrupt, endsInOrderAtAnyMomentOfTheStart) {
     // The moment moves along the start, in steps of what the program has done by then.
     for (int i = 0; i < 12; ++i) {
         const TestFolder out;
-        Host host({"play", "simulated:320x180@25,3600", "--rate", "realtime", "--out", out.getPath()});
+        Host host(
+            {"play", "simulated:320x180@25,3600", "--rate", "realtime", "--out", out.getPath()});
         // Before the handler is there the signal ends the program, as it does any other.
         for (int wait = 0; wait < i; ++wait) usleep(2000);
         host.interrupt();
@@ -92,8 +94,10 @@ TEST(MediaHostInterrupt, endsInOrderAtAnyMomentOfTheStart) {
 
 TEST(MediaHostInterrupt, endsAtOnceWhenAskedTwice) {
     const TestFolder out;
-    Host host({"play", "simulated:64x48@25,3600", "--rate", "realtime", "--loops", "0", "--out", out.getPath()});
-    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); })) << host.getOutput();
+    Host host({"play", "simulated:64x48@25,3600", "--rate", "realtime", "--loops", "0", "--out",
+               out.getPath()});
+    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); }))
+        << host.getOutput();
     host.interrupt();
     host.interrupt();
     EXPECT_EQ(host.join(), 130) << host.getOutput();

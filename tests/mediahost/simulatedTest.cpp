@@ -1,10 +1,9 @@
 // What works everywhere, with simulated sources.
 
-#include <gtest/gtest.h>
-
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <gtest/gtest.h>
 #include <set>
 
 #include "hostProgram.h"
@@ -22,8 +21,9 @@ public:
 
     std::string getText() const {
         char text[32];
-        std::snprintf(text, sizeof text, _isDropping ? "%02d;%02d;%02d;%02d" : "%02d:%02d:%02d:%02d",
-                      _hours, _minutes, _seconds, _frames);
+        std::snprintf(text, sizeof text,
+                      _isDropping ? "%02d;%02d;%02d;%02d" : "%02d:%02d:%02d:%02d", _hours, _minutes,
+                      _seconds, _frames);
         return text;
     }
     void step() {
@@ -56,18 +56,20 @@ TEST(MediaHost, burnsInAndReportsTheTimecodesOfEveryStandard) {
         int perSecond;
         bool isDropping;
     };
-    for (const Row& row : {Row{"film24", "24", 24, false}, Row{"pal", "25", 25, false},
-                           Row{"ntsc-nd", "30000/1001", 30, false},
-                           Row{"ntsc-df", "30000/1001", 30, true}}) {
+    for (const Row& row :
+         {Row{"film24", "24", 24, false}, Row{"pal", "25", 25, false},
+          Row{"ntsc-nd", "30000/1001", 30, false}, Row{"ntsc-df", "30000/1001", 30, true}}) {
         SCOPED_TRACE(row.name);
         const TestFolder folder;
         // Beyond the tenth minute, where dropping differs.
-        const HostRun run = runHost(std::string("play simulated:96x64@") + row.rate + ",610 --timecode " +
-                                    row.name + " --checksums --out " + folder.getPath());
+        const HostRun run =
+            runHost(std::string("play simulated:96x64@") + row.rate + ",610 --timecode " +
+                    row.name + " --checksums --out " + folder.getPath());
         ASSERT_EQ(run.code, 0) << run.output;
         const std::vector<FrameLine> lines = readFrames(folder / "frames.txt");
-        ASSERT_EQ(lines.size(), static_cast<std::size_t>(std::llround(
-                                    610.0 * (row.perSecond == 30 ? 30000.0 / 1001 : row.perSecond))));
+        ASSERT_EQ(lines.size(),
+                  static_cast<std::size_t>(std::llround(
+                      610.0 * (row.perSecond == 30 ? 30000.0 / 1001 : row.perSecond))));
         Wheels wheels(row.perSecond, row.isDropping);
         std::set<std::string> pictures;
         for (const FrameLine& line : lines) {
@@ -86,7 +88,10 @@ TEST(MediaHost, playsBackwardsAndInLoopsWhatItPlaysForwards) {
     ASSERT_EQ(runHost(input + "--out " + forwards.getPath()).code, 0);
     // Three pictures fit: each is made again and again.
     ASSERT_EQ(runHost(input + "--reverse --cache 3frames --out " + backwards.getPath()).code, 0);
-    ASSERT_EQ(runHost(input + "--loops 3 --cache 12frames --strategy random --out " + loops.getPath()).code, 0);
+    ASSERT_EQ(
+        runHost(input + "--loops 3 --cache 12frames --strategy random --out " + loops.getPath())
+            .code,
+        0);
     const std::vector<FrameLine> there = readFrames(forwards / "frames.txt");
     const std::vector<FrameLine> back = readFrames(backwards / "frames.txt");
     const std::vector<FrameLine> around = readFrames(loops / "frames.txt");
@@ -111,7 +116,10 @@ TEST(MediaHost, playsBackwardsAndInLoopsWhatItPlaysForwards) {
 
 TEST(MediaHost, writesAToneOfTheRightPitchAndLevel) {
     const TestFolder folder;
-    ASSERT_EQ(runHost("play simulated:32x32@25,2 --set mixer:channel1:gain=-6 --out " + folder.getPath()).code, 0);
+    ASSERT_EQ(
+        runHost("play simulated:32x32@25,2 --set mixer:channel1:gain=-6 --out " + folder.getPath())
+            .code,
+        0);
     const Wave wave = readWave(folder / "sound.wav");
     ASSERT_EQ(wave.rate, 48000);
     ASSERT_EQ(wave.nbChannels, 2);
@@ -165,15 +173,19 @@ TEST(MediaHost, tellsWhatIsWrongWithWhatItIsAskedFor) {
         {"play simulated --rate nan", "expected fast, realtime, or a multiple of real time"},
         {"play simulated --loops -1", "expected how often to play"},
         {"play simulated --strategy mru", "expected one of lru random, got \"mru\""},
-        {"play simulated --timecode ebu", "expected one of film24 pal ntsc-nd ntsc-df, got \"ebu\""},
+        {"play simulated --timecode ebu",
+         "expected one of film24 pal ntsc-nd ntsc-df, got \"ebu\""},
         {"play simulated:1x1@25,1", "the setting width=1 is no whole number from 16 to 8192"},
         {"play simulated:64x64@0,1", "the setting rate=0 is no rate such as 25 or 30000/1001"},
         {"play simulated:64", "expected simulated:WIDTHxHEIGHT@RATE,SECONDS"},
-        {"play simulated --set mixer:channel1:gain=99", "Value 99 is out of range for property gain"},
-        {"play simulated --set mixer:channel1:gain=loud", "\"loud\" is no value of the type double"},
+        {"play simulated --set mixer:channel1:gain=99",
+         "Value 99 is out of range for property gain"},
+        {"play simulated --set mixer:channel1:gain=loud",
+         "\"loud\" is no value of the type double"},
         {"play simulated --set mixer:channel1:gain", "expected DEVICE:PROPERTY=VALUE"},
         {"play simulated --set organ:gain=1", "Device name not found in the registry."},
-        {"play simulated --watch mixer:channel9:gain", "cannot watch the property \"mixer:channel9:gain\""},
+        {"play simulated --watch mixer:channel9:gain",
+         "cannot watch the property \"mixer:channel9:gain\""},
         {"get mixer:gain:", "cannot get the property \"mixer:gain:\""},
         {"set display:shown=1", "\"set\" is not available for property shown"},
         {"run missing.pipeline", "cannot open the pipeline \"missing.pipeline\""},
@@ -189,12 +201,14 @@ TEST(MediaHost, tellsWhatIsWrongWithWhatItIsAskedFor) {
 
 TEST(MediaHost, showsAndSetsPropertiesOfItsDevices) {
     const HostRun list = runHost("list");
-    for (const char* kind : {"reader", "mixer", "scope", "recorder", "display", "clock", "pattern", "tone"}) {
+    for (const char* kind :
+         {"reader", "mixer", "scope", "recorder", "display", "clock", "pattern", "tone"}) {
         EXPECT_THAT(list.output, HasSubstr(kind));
         EXPECT_EQ(runHost(std::string("describe ") + kind).code, 0) << kind;
     }
     EXPECT_THAT(runHost("describe mixer").output, HasSubstr("unit dB; -60 to 12"));
-    EXPECT_EQ(runHost("get pattern:video:width mixer:master:mute").output.substr(0, 10), "1280\nfalse");
+    EXPECT_EQ(runHost("get pattern:video:width mixer:master:mute").output.substr(0, 10),
+              "1280\nfalse");
     EXPECT_THAT(runHost("set mixer:master:mute=on mixer:channel4:gain=-2.5").output,
                 HasSubstr("mixer:channel4:gain = -2.5"));
     const HostRun watch = runHost("watch simulated:32x32@25,1 pattern:position mixer:master:peak");
@@ -229,7 +243,8 @@ TEST(MediaHost, playsWhatATextFileDescribes) {
     ASSERT_EQ(wave.samples.size(), 2u * 48000);
     const auto findHighest = [&wave](std::size_t first, std::size_t end) {
         int highest = 0;
-        for (std::size_t i = first * 2; i < end * 2; ++i) highest = std::max<int>(highest, wave.samples[i]);
+        for (std::size_t i = first * 2; i < end * 2; ++i)
+            highest = std::max<int>(highest, wave.samples[i]);
         return highest;
     };
     EXPECT_NEAR(findHighest(1000, 23000), 0.270 * 32768, 160);  // both; their crests do not meet
@@ -250,7 +265,8 @@ TEST(MediaHost, namesFileLineAndExpectationForABadPipeline) {
         {"device a tone volume=3", "there is no setting \"volume\""},
         {"device a tone hertz=x", "the setting hertz=x is no number from 1 to 20000"},
         {"device a tone hertz", "expected SETTING=VALUE, got \"hertz\""},
-        {"connect low:audio desk:channel3", "expected connect DEVICE:STREAM push|pull DEVICE:STREAM"},
+        {"connect low:audio desk:channel3",
+         "expected connect DEVICE:STREAM push|pull DEVICE:STREAM"},
         {"connect low:audio push desk:channel3", "cannot connect \"low:audio push desk:channel3\""},
         {"connect low:video push desk:channel3", "cannot connect"},
         {"connect desk:out push nobody:audio", "Device name not found in the registry."},
@@ -284,7 +300,8 @@ TEST(MediaHost, failsAsAWholeWhereAFileCannotBeWritten) {
     EXPECT_THAT(inFile.output, HasSubstr("cannot create the folder"));
     // A folder where the recorder wants its file.
     std::filesystem::create_directories(folder / "out/sound.wav.part");
-    const HostRun inWay = runHost("play simulated:64x48@25,60 --rate realtime --out " + (folder / "out"));
+    const HostRun inWay =
+        runHost("play simulated:64x48@25,60 --rate realtime --out " + (folder / "out"));
     EXPECT_EQ(inWay.code, 1) << inWay.output;
     EXPECT_THAT(inWay.output, HasSubstr("device \"recorder\" has failed"));
     EXPECT_THAT(inWay.output, HasSubstr("cannot create \""));

@@ -31,20 +31,22 @@ ClockDevice::ClockDevice(const Orv::LiString& name, HostContext& context, Settin
     settings.check();
     const auto rate = Orv::DevMDPropertyDescriptor<double>::create();
     rate->setUnit("beats per second of the show");
-    addProperty<double>("rate", "of the beats; 0: it follows the pictures",
-                        [this] { return _beatsPerSecond; }, nullptr, rate);
+    addProperty<double>(
+        "rate", "of the beats; 0: it follows the pictures", [this] { return _beatsPerSecond; },
+        nullptr, rate);
     const auto seconds = Orv::DevMDPropertyDescriptor<double>::create();
     seconds->setUnit("s");
-    addProperty<double>("time", "into the show", [this] { return getContext().pacer.getSeconds(); },
-                        nullptr, seconds);
+    addProperty<double>(
+        "time", "into the show", [this] { return getContext().pacer.getSeconds(); }, nullptr,
+        seconds);
     addProperty<std::uint64_t>("beats", "until now",
                                [this] { return getContext().pacer.getLateness().nbBeats; });
-    addProperty<double>("lateness:p99", "of the latest beats, against the steadiest of them",
-                        [this] { return getContext().pacer.getLateness().p99Seconds; }, nullptr,
-                        seconds);
-    addProperty<double>("lateness:max", "of the latest beats, against the steadiest of them",
-                        [this] { return getContext().pacer.getLateness().maxSeconds; }, nullptr,
-                        seconds);
+    addProperty<double>(
+        "lateness:p99", "of the latest beats, against the steadiest of them",
+        [this] { return getContext().pacer.getLateness().p99Seconds; }, nullptr, seconds);
+    addProperty<double>(
+        "lateness:max", "of the latest beats, against the steadiest of them",
+        [this] { return getContext().pacer.getLateness().maxSeconds; }, nullptr, seconds);
 }
 
 ClockDevice::~ClockDevice() noexcept(false) = default;
@@ -60,10 +62,11 @@ void ClockDevice::sync(const Orv::DtTime&, Orv::DevMDSyncSeqRequest&) {
 void ClockDevice::beginBeating() {
     if (_source) return;
     const HostContext& context = getContext();
-    const double rate = _beatsPerSecond > 0 ? _beatsPerSecond
+    const double rate = _beatsPerSecond > 0          ? _beatsPerSecond
                         : context.beatsPerSecond > 0 ? context.beatsPerSecond
                                                      : 100;
-    _source = std::make_unique<Orv::SeSourceClock>(getName() + " source", 1 / (rate * context.speed));
+    _source =
+        std::make_unique<Orv::SeSourceClock>(getName() + " source", 1 / (rate * context.speed));
     getContext().pacer.startPaced(rate, context.speed);
     Orv::ObjPtr<Orv::SeClientThread> client(new Client(getContext().pacer));
     _engine.addClient(getName() + " beat", client, *_source, 1);

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <memory>
-
 #include <orv/seSourceClock.h>
 #include <orv/seSyncEngine.h>
 
@@ -26,7 +25,7 @@ protected:
 private:
     class Client;
 
-    double _beatsPerSecond;  // of the setting, or 0
+    double _beatsPerSecond;                       // of the setting, or 0
     std::unique_ptr<Orv::SeSourceClock> _source;  // null: does not beat
     Orv::SeSyncEngine _engine;
     Orv::RCShdPtr<Orv::DevMDStdProperty<std::uint64_t>> _beatProperty;

@@ -58,7 +58,8 @@ void DisplayDevice::drawSheet() const {
     const int nbRows = (static_cast<int>(nbShown) + NB_COLUMNS - 1) / NB_COLUMNS;
     const int width = NB_COLUMNS * (WIDTH + MARGIN) + MARGIN;
     const int height = nbRows * (_height + CAPTION) + MARGIN;
-    std::vector<std::uint8_t> pixels(static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 3);
+    std::vector<std::uint8_t> pixels(static_cast<std::size_t>(width) *
+                                     static_cast<std::size_t>(height) * 3);
     const RgbView view{pixels.data(), width, height};
     fillRect(view, 0, 0, width, height, {18, 22, 28});
     for (std::size_t i = 0; i < nbShown; ++i) {

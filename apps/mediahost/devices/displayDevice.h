@@ -37,7 +37,7 @@ private:
     const bool _hasWindow;
     std::unique_ptr<Window> _window;  // null if there is none
     PictureScaler _scaler;
-    int _height = 0;  // of the thumbnails
+    int _height = 0;                     // of the thumbnails
     std::vector<Thumbnail> _thumbnails;  // every _stride-th picture
     std::int64_t _stride = 1;
     std::int64_t _nbPictures = 0;

@@ -1,7 +1,6 @@
 #include "hostContext.h"
 
 #include <orv/lkGuard.h>
-
 #include <orv/mbHeapManager.h>
 #include <orv/mbUnloadLRU.h>
 #include <orv/mbUnloadRandom.h>

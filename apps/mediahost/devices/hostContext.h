@@ -4,14 +4,13 @@
 #include <cstdint>
 #include <exception>
 #include <filesystem>
-#include <set>
-#include <string>
-
 #include <orv/liTimeCode.h>
 #include <orv/lkMutex.h>
 #include <orv/lkSema.h>
 #include <orv/mbManager.h>
 #include <orv/rcShdPtr.h>
+#include <set>
+#include <string>
 
 #include "pacer.h"
 
@@ -21,13 +20,13 @@ namespace MediaHost {
 ///
 /// - Threads: the settings are only read once there are devices; all else by any thread.
 struct HostContext {
-    std::uint64_t cacheBytes = 0;     ///< The budget of pictures.
-    std::int64_t cachePictures = 0;   ///< If not 0: the budget is so many of the first source's.
-    bool isCacheRandom = false;       ///< Which ones give way: any, or those used longest ago.
+    std::uint64_t cacheBytes = 0;    ///< The budget of pictures.
+    std::int64_t cachePictures = 0;  ///< If not 0: the budget is so many of the first source's.
+    bool isCacheRandom = false;      ///< Which ones give way: any, or those used longest ago.
     Orv::RCShdPtr<Orv::LiTimeCode> timecode;
     std::filesystem::path folder;  ///< Where files go; empty: none are written.
     bool isPaced = false;
-    double speed = 1;  ///< Against real time, if paced.
+    double speed = 1;           ///< Against real time, if paced.
     double beatsPerSecond = 0;  ///< Of the clock; 0: as many as the sources have pictures.
     bool isReverse = false;
     std::int64_t nbLoops = 1;  ///< 0: for ever.

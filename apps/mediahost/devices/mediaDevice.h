@@ -1,10 +1,9 @@
 #pragma once
 
-#include <string>
-#include <vector>
-
 #include <orv/devMDStdStreamActiveSource.h>
 #include <orv/devMDStdSyncSeqDevice.h>
+#include <string>
+#include <vector>
 
 #include "hostContext.h"
 #include "mediaError.h"
@@ -84,8 +83,8 @@ void MediaDevice::addInput(const Orv::LiString& name, const Orv::LiString& descr
         take(ours);
     };
     _inputs.push_back({addSink(name, description, [this, input, work](Orv::ObjPtr<Elem> elem) {
-                           this->take(input, std::move(elem), work);
-                       })});
+        this->take(input, std::move(elem), work);
+    })});
 }
 
 }  // namespace MediaHost

@@ -50,8 +50,9 @@ void MixerDevice::addStrip(const std::string& set, Strip& strip) {
     const auto level = Orv::DevMDPropertyDescriptor<float>::create();
     level->setUnit("dBFS");
     strip.shownPeak = SILENCE;
-    strip.meter = addProperty<float>((set + ":peak").c_str(), "highest level of the last tenth second",
-                                     [&strip] { return strip.shownPeak; }, nullptr, level);
+    strip.meter =
+        addProperty<float>((set + ":peak").c_str(), "highest level of the last tenth second",
+                           [&strip] { return strip.shownPeak; }, nullptr, level);
 }
 
 void MixerDevice::take(std::size_t channel, const Orv::RCShdPtr<SoundBuf>& buf) {
@@ -95,8 +96,8 @@ void MixerDevice::mix() {
     for (float& sample : sum) sample *= factor;
     _master.peak = std::max(_master.peak, findPeak(sum));
     notifyMeters(nbSamples);
-    _out->push(createElem(
-        Orv::RCShdPtr<Orv::DevMDStreamBuf>(new SoundBuf(_format, std::move(sum)))));
+    _out->push(
+        createElem(Orv::RCShdPtr<Orv::DevMDStreamBuf>(new SoundBuf(_format, std::move(sum)))));
 }
 
 void MixerDevice::addChannel(Channel& channel, std::vector<float>& sum,

@@ -27,8 +27,8 @@ private:
     struct Strip {
         double gain = 0;  // dB
         bool isMuted = false;
-        float peak = 0;         // since the last notification
-        float shownPeak = 0;    // dB full scale
+        float peak = 0;       // since the last notification
+        float shownPeak = 0;  // dB full scale
         Orv::RCShdPtr<Orv::DevMDStdProperty<float>> meter;
 
         float getFactor() const;

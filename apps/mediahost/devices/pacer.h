@@ -2,10 +2,9 @@
 
 #include <atomic>
 #include <cstdint>
-#include <vector>
-
 #include <orv/lkCondVar.h>
 #include <orv/lkMutex.h>
+#include <vector>
 
 namespace MediaHost {
 
@@ -20,13 +19,13 @@ public:
         double p50Seconds = 0, p99Seconds = 0, maxSeconds = 0;
     };
 
-    void startUnpaced();                       ///< Everything is due from now on.
+    void startUnpaced();  ///< Everything is due from now on.
     /// The first beat is the start of the show.
     /// @param beatsPerSecond  of the show, which runs @p speed times as fast as time does.
     void startPaced(double beatsPerSecond, double speed);
-    void setBeat(std::uint64_t beat);          ///< By the clock, which takes the time, too.
-    void stop();                               ///< Nothing more is waited for.
-    void wakeAll();                            ///< Those that wait look whether they are stopped.
+    void setBeat(std::uint64_t beat);  ///< By the clock, which takes the time, too.
+    void stop();                       ///< Nothing more is waited for.
+    void wakeAll();                    ///< Those that wait look whether they are stopped.
 
     /// Waits until what lies @p seconds into the show is due.
     /// @param isStopped  ends the wait, after a wakeAll().
@@ -36,8 +35,8 @@ public:
     /// Whether that was due more than one whole beat ago.
     bool isOverdue(double seconds) const;
 
-    double getSeconds() const;      ///< The beats until now, as time.
-    Lateness getLateness() const;   ///< Of the latest beats, measured against the steadiest of them.
+    double getSeconds() const;     ///< The beats until now, as time.
+    Lateness getLateness() const;  ///< Of the latest beats, measured against the steadiest of them.
 
 private:
     enum class State { HELD, UNPACED, PACED, STOPPED };

@@ -11,8 +11,7 @@ bool ReaderDevice::isAvailable() {
 }
 
 void ReaderDevice::openFile() {
-    auto pictures =
-        FfmpegInput::tryOpen(_file, AVMEDIA_TYPE_VIDEO, static_cast<int>(_nbThreads));
+    auto pictures = FfmpegInput::tryOpen(_file, AVMEDIA_TYPE_VIDEO, static_cast<int>(_nbThreads));
     auto sound = FfmpegInput::tryOpen(_file, AVMEDIA_TYPE_AUDIO, 1);
     if (!pictures && !sound) {
         throw MediaError('"' + _file + "\" has neither pictures nor sound");

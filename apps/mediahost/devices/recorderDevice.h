@@ -27,7 +27,7 @@ protected:
 private:
     const bool _hasFrames;
     const bool _hasChecksums;
-    std::unique_ptr<WaveFile> _sound;       // null: none yet
+    std::unique_ptr<WaveFile> _sound;        // null: none yet
     std::unique_ptr<OutputFile> _checksums;  // null: none yet
     PictureScaler _scaler;
     std::vector<std::uint8_t> _pixels;

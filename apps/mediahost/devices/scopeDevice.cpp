@@ -10,7 +10,8 @@ namespace MediaHost {
 ScopeDevice::ScopeDevice(const Orv::LiString& name, HostContext& context, Settings settings)
     : MediaDevice(name, context) {
     settings.check();
-    addInput<SoundBuf>("audio", "sound/*", [this](const Orv::RCShdPtr<SoundBuf>& buf) { take(buf); });
+    addInput<SoundBuf>("audio", "sound/*",
+                       [this](const Orv::RCShdPtr<SoundBuf>& buf) { take(buf); });
     _through = addOutput("through", "sound/float");
     addProperty<float>("level:peak", "highest magnitude until now, 1 being full scale",
                        [this] { return _peak; });
@@ -87,14 +88,17 @@ void ScopeDevice::draw() const {
     fillRect(view, 0, MIDDLE, WIDTH, 1, {52, 60, 70});
     for (int x = 0; x < WIDTH; ++x) {
         const std::size_t first = static_cast<std::size_t>(x) * _extents.size() / WIDTH;
-        const std::size_t end = std::max(first + 1, (static_cast<std::size_t>(x) + 1) * _extents.size() / WIDTH);
+        const std::size_t end =
+            std::max(first + 1, (static_cast<std::size_t>(x) + 1) * _extents.size() / WIDTH);
         Extent all = _extents[first];
         for (std::size_t i = first; i < end; ++i) {
             all.lowest = std::min(all.lowest, _extents[i].lowest);
             all.highest = std::max(all.highest, _extents[i].highest);
         }
-        const int top = MIDDLE - static_cast<int>(std::lround(std::clamp(all.highest, -1.0F, 1.0F) * MIDDLE));
-        const int bottom = MIDDLE - static_cast<int>(std::lround(std::clamp(all.lowest, -1.0F, 1.0F) * MIDDLE));
+        const int top =
+            MIDDLE - static_cast<int>(std::lround(std::clamp(all.highest, -1.0F, 1.0F) * MIDDLE));
+        const int bottom =
+            MIDDLE - static_cast<int>(std::lround(std::clamp(all.lowest, -1.0F, 1.0F) * MIDDLE));
         fillRect(view, x, top, 1, bottom - top + 1, {86, 196, 160});
     }
     writePng(getContext().folder / "waveform.png", view);

@@ -22,7 +22,7 @@ private:
 
     Orv::RCShdPtr<Source> _through;
     SoundFormat _format;
-    std::vector<Extent> _extents;          // of _samplesPerExtent samples each, the last one maybe of less
+    std::vector<Extent> _extents;  // of _samplesPerExtent samples each, the last one maybe of less
     std::int64_t _samplesPerExtent = 64;
     std::int64_t _nbSamples = 0;
     double _sumOfSquares = 0;

@@ -35,7 +35,8 @@ std::int64_t Settings::getNumber(const std::string& name, std::int64_t otherwise
     const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
     if (error != std::errc() || end != text.data() + text.size() || number < lowest ||
         number > highest) {
-        fail(name, text, "whole number from " + std::to_string(lowest) + " to " + std::to_string(highest));
+        fail(name, text,
+             "whole number from " + std::to_string(lowest) + " to " + std::to_string(highest));
     }
     return number;
 }

@@ -1,9 +1,8 @@
 #pragma once
 
 #include <map>
-#include <string>
-
 #include <orv/rational.h>
+#include <string>
 
 namespace MediaHost {
 

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cmath>
-
 #include <orv/lkGuard.h>
 
 namespace MediaHost {
@@ -32,38 +31,38 @@ void SourceDevice::addProperties() {
     number->setUnit("pictures").setRange(0, INT64_MAX);
     _positionProperty = addProperty<std::int64_t>(
         "position", "number of the picture shown last; set: the one to go on with",
-        [this] { return _position.load(); }, [this](const std::int64_t& unit) { _jump = unit; }, number);
+        [this] { return _position.load(); }, [this](const std::int64_t& unit) { _jump = unit; },
+        number);
     addProperty<std::int64_t>("video:shown", "pictures that were handed on",
                               [this] { return _nbShown.load(); });
     addProperty<std::int64_t>("video:dropped", "pictures that came too late to be handed on",
                               [this] { return _nbDropped.load(); });
-    addProperty<std::int64_t>("video:decoded", "pictures decoded, those decoded again included", [this] {
-        return static_cast<std::int64_t>(_pictures ? _pictures->getNbDecoded() : 0);
-    });
+    addProperty<std::int64_t>(
+        "video:decoded", "pictures decoded, those decoded again included",
+        [this] { return static_cast<std::int64_t>(_pictures ? _pictures->getNbDecoded() : 0); });
     addProperty<std::int64_t>("video:faults", "damaged pieces left out", [this] {
         return static_cast<std::int64_t>(_pictures ? _pictures->getNbFaults() : 0);
     });
     addProperty<std::int64_t>("audio:faults", "damaged pieces left out", [this] {
         return static_cast<std::int64_t>(_sound ? _sound->getNbFaults() : 0);
     });
-    addProperty<int>("video:width", "of the pictures; 0: there are none", [this] {
-        return _pictureFormat ? _pictureFormat->width : 0;
-    });
-    addProperty<int>("video:height", "of the pictures; 0: there are none", [this] {
-        return _pictureFormat ? _pictureFormat->height : 0;
-    });
+    addProperty<int>("video:width", "of the pictures; 0: there are none",
+                     [this] { return _pictureFormat ? _pictureFormat->width : 0; });
+    addProperty<int>("video:height", "of the pictures; 0: there are none",
+                     [this] { return _pictureFormat ? _pictureFormat->height : 0; });
     const auto rate = Orv::DevMDPropertyDescriptor<double>::create();
     rate->setUnit("pictures per second");
-    addProperty<double>("rate", "of the pictures, on average", [this] {
-        return _pictureFormat ? _pictureFormat->rate.toDouble() : 0;
-    }, nullptr, rate);
+    addProperty<double>(
+        "rate", "of the pictures, on average",
+        [this] { return _pictureFormat ? _pictureFormat->rate.toDouble() : 0; }, nullptr, rate);
     addProperty<TextValue>("format", "how the pictures lie in memory", [this] {
         return toTextValue(_pictureFormat ? _pictureFormat->pixelName : "none");
     });
     const auto hertz = Orv::DevMDPropertyDescriptor<int>::create();
     hertz->setUnit("Hz");
-    addProperty<int>("audio:rate", "of the sound; 0: there is none",
-                     [this] { return _soundFormat ? _soundFormat->rate : 0; }, nullptr, hertz);
+    addProperty<int>(
+        "audio:rate", "of the sound; 0: there is none",
+        [this] { return _soundFormat ? _soundFormat->rate : 0; }, nullptr, hertz);
     addProperty<int>("audio:channels", "of the sound",
                      [this] { return _soundFormat ? _soundFormat->nbChannels : 0; });
 }
@@ -73,8 +72,8 @@ void SourceDevice::addPictures(std::unique_ptr<UnitDecoder> decoder, const Pictu
     const Orv::RCShdPtr<Orv::MbManager> manager = getContext().getPictures(unitBytes);
     if (unitBytes > getContext().cacheBytes) {
         throw MediaError("one picture takes " + std::to_string(unitBytes) +
-                         " bytes, the cache has only " +
-                         std::to_string(getContext().cacheBytes) + "; give it more with --cache");
+                         " bytes, the cache has only " + std::to_string(getContext().cacheBytes) +
+                         "; give it more with --cache");
     }
     _pictureFormat = std::make_shared<const PictureFormat>(format);
     _pictures = std::make_unique<Track>(getName() + " pictures", std::move(decoder), manager);
@@ -86,16 +85,17 @@ void SourceDevice::addPictures(std::unique_ptr<UnitDecoder> decoder, const Pictu
                                     ";width=" + std::to_string(format.width) +
                                     ";height=" + std::to_string(format.height);
     _pictureLoop = addLoopSource("video", description.c_str(), [this, nbAhead](Loop& loop) {
-        play(loop, *_pictures, nbAhead, true, [this](Loop& to, Orv::MbBufferRdGuardImp guard, std::int64_t unit) {
-            return pushPicture(to, std::move(guard), unit);
-        });
+        play(loop, *_pictures, nbAhead, true,
+             [this](Loop& to, Orv::MbBufferRdGuardImp guard, std::int64_t unit) {
+                 return pushPicture(to, std::move(guard), unit);
+             });
     });
 }
 
 void SourceDevice::addSound(std::unique_ptr<UnitDecoder> decoder, const SoundFormat& format) {
     _soundFormat = format;
-    _sound = std::make_unique<Track>(getName() + " sound", std::move(decoder),
-                                     getContext().getSounds());
+    _sound =
+        std::make_unique<Track>(getName() + " sound", std::move(decoder), getContext().getSounds());
     const std::string description = "sound/float;rate=" + std::to_string(format.rate) +
                                     ";channels=" + std::to_string(format.nbChannels);
     _soundLoop = addLoopSource("audio", description.c_str(), [this](Loop& loop) {

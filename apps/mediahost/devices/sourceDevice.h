@@ -16,9 +16,7 @@ public:
     ~SourceDevice() noexcept(false) override;
 
     const PictureFormat* getPictureFormat() const { return _pictureFormat.get(); }  ///< Or null.
-    const SoundFormat* getSoundFormat() const {
-        return _soundFormat ? &*_soundFormat : nullptr;
-    }
+    const SoundFormat* getSoundFormat() const { return _soundFormat ? &*_soundFormat : nullptr; }
 
 protected:
     SourceDevice(const Orv::LiString& name, HostContext& context);

@@ -1,11 +1,10 @@
 #pragma once
 
 #include <memory>
-#include <utility>
-#include <vector>
-
 #include <orv/devMDStreamElem.h>
 #include <orv/mbBufferRdGuardImp.h>
+#include <utility>
+#include <vector>
 
 #include "formats.h"
 

@@ -45,8 +45,9 @@ private:
     }
 
     void open(const PictureFormat& format) {
-        _window = SDL_CreateWindow("orv-mediahost", SDL_WINDOWPOS_UNDEFINED, SDL_WINDOWPOS_UNDEFINED,
-                                   format.width, format.height, SDL_WINDOW_RESIZABLE);
+        _window =
+            SDL_CreateWindow("orv-mediahost", SDL_WINDOWPOS_UNDEFINED, SDL_WINDOWPOS_UNDEFINED,
+                             format.width, format.height, SDL_WINDOW_RESIZABLE);
         if (_window == nullptr) fail("cannot open a window");
         _renderer = SDL_CreateRenderer(_window, -1, 0);
         if (_renderer == nullptr) fail("cannot draw into a window");

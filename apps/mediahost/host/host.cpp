@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <iostream>
-
 #include <orv/devMgrEx.h>
 #include <orv/devMgrPropertyObserverUtil.h>
 #include <orv/devRegistry.h>
@@ -46,7 +45,8 @@ const std::pair<DeviceKind, Create> KINDS[] = {
     {{"reader", "reads a file of any kind that FFmpeg knows"}, createEntry<ReaderDevice>},
     {{"pattern", "colour bars with burnt-in timecode; needs no file"}, createEntry<PatternDevice>},
     {{"tone", "a sine tone with a click each second; needs no file"}, createEntry<ToneDevice>},
-    {{"mixer", "adds four channels of sound, with gains, mutes and meters"}, createEntry<MixerDevice>},
+    {{"mixer", "adds four channels of sound, with gains, mutes and meters"},
+     createEntry<MixerDevice>},
     {{"scope", "levels of the sound, and a picture of its waveform"}, createEntry<ScopeDevice>},
     {{"display", "a window, and a contact sheet of the pictures"}, createEntry<DisplayDevice>},
     {{"recorder", "writes sound as WAV, and pictures as PNG"}, createEntry<RecorderDevice>},
@@ -105,7 +105,8 @@ void Host::applyOptions() {
     _context.timecode = createTimecode(_pipeline.timecode);
     _context.folder = _pipeline.folder;
     _context.isPaced = _pipeline.rate != "fast";
-    if (_context.isPaced && _pipeline.rate != "realtime") _context.speed = std::stod(_pipeline.rate);
+    if (_context.isPaced && _pipeline.rate != "realtime")
+        _context.speed = std::stod(_pipeline.rate);
     _context.isReverse = _pipeline.isReverse;
     _context.nbLoops = _pipeline.nbLoops;
 }
@@ -187,9 +188,8 @@ std::string Host::getProperty(const std::string& property) {
 }
 
 void Host::setProperty(const std::string& property, const std::string& value) {
-    doing("cannot set the property \"" + property + "\" to \"" + value + '"', [&] {
-        PropertyText::set(_properties->getProperty(property.c_str()), value);
-    });
+    doing("cannot set the property \"" + property + "\" to \"" + value + '"',
+          [&] { PropertyText::set(_properties->getProperty(property.c_str()), value); });
 }
 
 void Host::watch(const std::string& property) {
@@ -213,7 +213,8 @@ void Host::connect() {
         });
     }
     _tree = _pipeline.sequence.text.empty() ? makeTree() : _pipeline.sequence.text;
-    const std::string where = _pipeline.sequence.where.empty() ? "" : _pipeline.sequence.where + ": ";
+    const std::string where =
+        _pipeline.sequence.where.empty() ? "" : _pipeline.sequence.where + ": ";
     doing(where + "cannot arrange the sequence \"" + _tree + '"',
           [&] { _sequence->configure(_tree.c_str()); });
 }

@@ -1,13 +1,12 @@
 #pragma once
 
 #include <memory>
-#include <string>
-#include <vector>
-
 #include <orv/devMgr.h>
 #include <orv/devMgrPropertyAcc.h>
 #include <orv/devMgrStreamAcc.h>
 #include <orv/devMgrSyncSeqAcc.h>
+#include <string>
+#include <vector>
 
 #include "hostContext.h"
 #include "mediaDevice.h"

@@ -16,7 +16,8 @@ namespace {
 using Words = std::vector<std::string>;
 
 [[noreturn]] void expect(const std::string& expected, const std::string& got) {
-    throw MediaError("expected " + expected + (got.empty() ? ", got nothing" : ", got \"" + got + '"'));
+    throw MediaError("expected " + expected +
+                     (got.empty() ? ", got nothing" : ", got \"" + got + '"'));
 }
 
 template <class T>
@@ -104,20 +105,25 @@ private:
             {"device", [](Reader& r, const Words& w) { r.takeDevice(w); }},
             {"connect", [](Reader& r, const Words& w) { r.takeConnection(w); }},
             {"sequence", [](Reader& r, const Words& w) { r.takeSequence(w); }},
-            {"set", [](Reader& r, const Words& w) {
+            {"set",
+             [](Reader& r, const Words& w) {
                  const std::string& text = only(w, "DEVICE:PROPERTY=VALUE");
                  if (text.find('=') == std::string::npos) expect("DEVICE:PROPERTY=VALUE", text);
                  r._pipeline.sets.push_back({text, r.where()});
              }},
-            {"watch", [](Reader& r, const Words& w) {
+            {"watch",
+             [](Reader& r, const Words& w) {
                  r._pipeline.watches.push_back({only(w, "DEVICE:PROPERTY"), r.where()});
              }},
             {"cache", [](Reader& r, const Words& w) { r._pipeline.setCache(only(w, "a size")); }},
-            {"strategy", [](Reader& r, const Words& w) { r._pipeline.setStrategy(only(w, "a strategy")); }},
-            {"timecode", [](Reader& r, const Words& w) { r._pipeline.setTimecode(only(w, "a timecode")); }},
+            {"strategy",
+             [](Reader& r, const Words& w) { r._pipeline.setStrategy(only(w, "a strategy")); }},
+            {"timecode",
+             [](Reader& r, const Words& w) { r._pipeline.setTimecode(only(w, "a timecode")); }},
             {"rate", [](Reader& r, const Words& w) { r._pipeline.setRate(only(w, "a rate")); }},
             {"loops", [](Reader& r, const Words& w) { r._pipeline.setLoops(only(w, "a number")); }},
-            {"reverse", [](Reader& r, const Words& w) {
+            {"reverse",
+             [](Reader& r, const Words& w) {
                  if (w.size() != 1) expect("nothing behind \"reverse\"", join(w, 1));
                  r._pipeline.isReverse = true;
              }},
@@ -127,8 +133,10 @@ private:
         if (words.empty()) return;
         const auto found = TAKES.find(words[0]);
         if (found == TAKES.end()) {
-            expect("device, connect, sequence, set, watch, cache, strategy, timecode, rate, loops, "
-                   "reverse, out or trace", words[0]);
+            expect(
+                "device, connect, sequence, set, watch, cache, strategy, timecode, rate, loops, "
+                "reverse, out or trace",
+                words[0]);
         }
         found->second(*this, words);
     }
@@ -174,7 +182,8 @@ void Pipeline::setCache(const std::string& text) {
     const std::string unit(end, text.data() + text.size());
     static const std::map<std::string, int> SHIFTS = {
         {"", 0}, {"k", 10}, {"K", 10}, {"M", 20}, {"G", 30}};
-    if (error != std::errc() || number == 0 || number > (std::uint64_t{1} << 30)) expect(expected, text);
+    if (error != std::errc() || number == 0 || number > (std::uint64_t{1} << 30))
+        expect(expected, text);
     if (unit == "frames" || unit == "frame") {
         cachePictures = static_cast<std::int64_t>(number);
         return;

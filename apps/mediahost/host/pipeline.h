@@ -40,7 +40,9 @@ struct Pipeline {
     std::filesystem::path trace;   ///< Empty: none.
 
     void addDevice(const std::string& name, const std::string& kind, Settings settings = {});
-    void connect(const std::string& text) { connections.push_back({text, "the connection " + text}); }
+    void connect(const std::string& text) {
+        connections.push_back({text, "the connection " + text});
+    }
 
     // Options from text; @throws MediaError that says what was expected
     void setCache(const std::string& text);  ///< "64M", "1G", "512k", "10frames"

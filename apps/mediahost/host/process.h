@@ -12,9 +12,9 @@ namespace Process {
 void catchInterrupts();
 bool isInterrupted();
 
-bool isTerminal();                ///< Does a person see what the program writes?
-std::uint64_t getPeakBytes();     ///< The most memory the program has had at a time.
-double getProcessorSeconds();     ///< Spent by all its threads.
+bool isTerminal();             ///< Does a person see what the program writes?
+std::uint64_t getPeakBytes();  ///< The most memory the program has had at a time.
+double getProcessorSeconds();  ///< Spent by all its threads.
 double getSecondsSinceStart();
 
 }  // namespace Process

@@ -1,6 +1,6 @@
 #include <io.h>
-#include <windows.h>
 #include <psapi.h>
+#include <windows.h>
 
 #include "process.h"
 
@@ -21,7 +21,8 @@ double getProcessorSeconds() {
     FILETIME created{}, ended{}, kernel{}, user{};
     if (::GetProcessTimes(::GetCurrentProcess(), &created, &ended, &kernel, &user) == 0) return 0;
     const auto toSeconds = [](const FILETIME& time) {
-        return (static_cast<double>(time.dwHighDateTime) * 4294967296.0 + time.dwLowDateTime) * 1e-7;
+        return (static_cast<double>(time.dwHighDateTime) * 4294967296.0 + time.dwLowDateTime) *
+               1e-7;
     };
     return toSeconds(kernel) + toSeconds(user);
 }

@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cstdio>
 #include <iostream>
-
 #include <orv/devMgrPropertyValueUtil.h>
 
 #include "host.h"
@@ -20,7 +19,8 @@ constexpr int BAR_WIDTH = 20;
 double getOr(Orv::DevMgrPropertyAcc& properties, const std::string& name, double otherwise) {
     try {
         double value = 0;
-        Orv::DevMgrPropertyValueUtil<double>::getValue(properties, name.c_str(), value, GET_SECONDS);
+        Orv::DevMgrPropertyValueUtil<double>::getValue(properties, name.c_str(), value,
+                                                       GET_SECONDS);
         return value;
     } catch (const std::exception&) {
         return otherwise;
@@ -40,7 +40,8 @@ Progress::Progress(Host& host) : _host(host), _isTerminal(Process::isTerminal())
         const auto device = Orv::RCShdPtr<MediaDevice>::dynamicCast(host.getDevice(spec.name));
         if (!device.isNull()) _devices.push_back(device);
         const auto source = Orv::RCShdPtr<SourceDevice>::dynamicCast(device);
-        if (!_position.isNull() || source.isNull() || source->getPictureFormat() == nullptr) continue;
+        if (!_position.isNull() || source.isNull() || source->getPictureFormat() == nullptr)
+            continue;
         _rate = source->getPictureFormat()->rate.toDouble();
         _duration = getOr(host.getProperties(), spec.name + ":duration", 0);
         _position = Orv::DevMgrPropertyValueUtil<std::int64_t>::resolve(
@@ -68,9 +69,9 @@ void Progress::show() {
         return;
     }
     const double seconds = _rate > 0 ? static_cast<double>(position) / _rate : 0;
-    const int nbDone = _duration > 0
-                           ? std::clamp(static_cast<int>(seconds / _duration * BAR_WIDTH), 0, BAR_WIDTH)
-                           : 0;
+    const int nbDone =
+        _duration > 0 ? std::clamp(static_cast<int>(seconds / _duration * BAR_WIDTH), 0, BAR_WIDTH)
+                      : 0;
     std::cout << "\r[" << std::string(static_cast<std::size_t>(nbDone), '#')
               << std::string(static_cast<std::size_t>(BAR_WIDTH - nbDone), '.') << "] " << text
               << "\x1b[K" << std::flush;

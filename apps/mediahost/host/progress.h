@@ -1,9 +1,8 @@
 #pragma once
 
+#include <orv/devMDProperty.h>
 #include <string>
 #include <vector>
-
-#include <orv/devMDProperty.h>
 
 namespace MediaHost {
 
@@ -26,8 +25,8 @@ private:
     Host& _host;
     const bool _isTerminal;
     Orv::RCShdPtr<Orv::DevMDProperty<std::int64_t>> _position;  // null without pictures
-    double _rate = 0;      // of the pictures
-    double _duration = 0;  // seconds; 0: unknown
+    double _rate = 0;                                           // of the pictures
+    double _duration = 0;                                       // seconds; 0: unknown
     std::vector<Orv::RCShdPtr<MediaDevice>> _devices;
     double _nextSeconds = 0;
     bool _isBarOpen = false;

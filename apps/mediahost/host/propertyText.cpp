@@ -1,7 +1,6 @@
 #include "propertyText.h"
 
 #include <charconv>
-
 #include <orv/devMDProperty.h>
 
 #include "mediaDevice.h"
@@ -38,7 +37,8 @@ constexpr const char* NAME<bool> = "bool";
 
 template <class T, class Work>
 bool tryType(const Property& property, Work& work) {
-    if (auto scalar = Orv::RCShdPtr<Orv::DevMDProperty<T>>::dynamicCast(property); !scalar.isNull()) {
+    if (auto scalar = Orv::RCShdPtr<Orv::DevMDProperty<T>>::dynamicCast(property);
+        !scalar.isNull()) {
         work.template apply<T>(*scalar);
         return true;
     }

@@ -1,9 +1,8 @@
 #pragma once
 
-#include <string>
-
 #include <orv/devMDPropertyAny.h>
 #include <orv/rcShdPtr.h>
+#include <string>
 
 namespace MediaHost {
 
@@ -14,7 +13,7 @@ namespace PropertyText {
 
 using Property = Orv::RCShdPtr<Orv::DevMDPropertyAny>;
 
-std::string getTypeName(const Property& property);  ///< Such as "double" or "float[]".
+std::string getTypeName(const Property& property);          ///< Such as "double" or "float[]".
 std::string get(const Property& property, double seconds);  ///< Waits at most so long.
 void set(const Property& property, const std::string& value);
 

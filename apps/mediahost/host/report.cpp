@@ -2,10 +2,9 @@
 
 #include <cmath>
 #include <iomanip>
-#include <ostream>
-
 #include <orv/buildInfo.h>
 #include <orv/xmlStreamer.h>
+#include <ostream>
 
 #include "outputFile.h"
 #include "process.h"
@@ -42,11 +41,13 @@ void Report::collect(const Pipeline::Device& spec) {
     if (_host.getTree().find(spec.name) != std::string::npos) {
         device.latencySeconds = _host.getSequence().getLatency(spec.name.c_str()).getSeconds();
     }
-    const auto prtcl = Orv::RCShdPtr<Orv::DevMDPropertyPrtcl>::dynamicCast(_host.getDevice(spec.name));
+    const auto prtcl =
+        Orv::RCShdPtr<Orv::DevMDPropertyPrtcl>::dynamicCast(_host.getDevice(spec.name));
     if (!prtcl.isNull()) {
         collectProperties(device, prtcl->getPropertyIter(), "");
         for (const auto& set : prtcl->getPropertySetIter()) {
-            collectProperties(device, set->getPropertyIter(), std::string(set->getName().getText()) + ':');
+            collectProperties(device, set->getPropertyIter(),
+                              std::string(set->getName().getText()) + ':');
         }
     }
     count(device);
@@ -93,7 +94,8 @@ void Report::count(const Device& device) {
     const double duration = toNumber(find(device, "duration"));
     const double rate = toNumber(find(device, "rate"));
     const Pipeline& pipeline = _host.getPipeline();
-    if (!_isWhole || device.kind != "reader" || pipeline.nbLoops == 0 || duration == 0 || rate == 0) return;
+    if (!_isWhole || device.kind != "reader" || pipeline.nbLoops == 0 || duration == 0 || rate == 0)
+        return;
     const double seconds = static_cast<double>(number("video:shown") + number("video:dropped")) /
                            rate / static_cast<double>(pipeline.nbLoops);
     if (seconds < duration * 0.98 - 0.5) {
@@ -110,9 +112,11 @@ void Report::print(std::ostream& stream) const {
     stream << std::fixed << std::setprecision(2);
     stream << (_isWhole ? "played" : "interrupted after") << ' ' << seconds << " s\n";
     if (_nbShown + _nbDropped > 0) {
-        stream << "pictures   " << _nbShown << " shown, " << _nbDropped << " dropped, " << _nbDecoded
-               << " decoded, " << static_cast<double>(_nbShown) / std::max(seconds, 1e-3)
-               << " per second; the first after " << context.getFirstPictureSeconds() * 1e3 << " ms\n"
+        stream << "pictures   " << _nbShown << " shown, " << _nbDropped << " dropped, "
+               << _nbDecoded << " decoded, "
+               << static_cast<double>(_nbShown) / std::max(seconds, 1e-3)
+               << " per second; the first after " << context.getFirstPictureSeconds() * 1e3
+               << " ms\n"
                << "cache      " << toMegabytes(cache.bytesInUse) << " of "
                << toMegabytes(context.cacheBytes) << " MB in use, " << cache.counts.nbHits
                << " hits, " << cache.counts.nbReloads << " loads, " << cache.counts.nbEvictions
@@ -156,10 +160,12 @@ void Report::write(const std::filesystem::path& path) const {
         {
             Element element(root, "cache");
             element.addAttribute("strategy", _host.getPipeline().strategy.c_str());
-            element.addAttribute("budgetBytes", static_cast<unsigned long long>(context.cacheBytes));
+            element.addAttribute("budgetBytes",
+                                 static_cast<unsigned long long>(context.cacheBytes));
             element.addAttribute("hits", static_cast<unsigned long long>(cache.counts.nbHits));
             element.addAttribute("loads", static_cast<unsigned long long>(cache.counts.nbReloads));
-            element.addAttribute("evictions", static_cast<unsigned long long>(cache.counts.nbEvictions));
+            element.addAttribute("evictions",
+                                 static_cast<unsigned long long>(cache.counts.nbEvictions));
         }
         if (context.isPaced) {
             const Pacer::Lateness late = context.pacer.getLateness();
@@ -207,9 +213,10 @@ void describeProperties(Orv::DevMDPropertySet::Properties properties, const std:
         const unsigned attributes = property->getAttributes();
         const bool isReadable = (attributes & Orv::DevMDPropertyAny::READABLE) != 0;
         const bool isWritable = (attributes & Orv::DevMDPropertyAny::WRITABLE) != 0;
-        stream << "  " << std::left << std::setw(26) << prefix + property->getName().getChars() << ' '
-               << std::setw(8) << PropertyText::getTypeName(property) << (isReadable ? " r" : " -")
-               << (isWritable ? "w" : "-") << "  " << property->getDescription();
+        stream << "  " << std::left << std::setw(26) << prefix + property->getName().getChars()
+               << ' ' << std::setw(8) << PropertyText::getTypeName(property)
+               << (isReadable ? " r" : " -") << (isWritable ? "w" : "-") << "  "
+               << property->getDescription();
         if (const auto descriptor = property->getDescriptor(); !descriptor.isNull()) {
             if (!descriptor->getUnit().isEmpty()) stream << "; unit " << descriptor->getUnit();
             if (!descriptor->getRangeText().isEmpty()) stream << "; " << descriptor->getRangeText();
@@ -230,14 +237,17 @@ std::string quote(const std::string& text) {
 void describeDevice(Host& host, const std::string& name, std::ostream& stream) {
     const Orv::RCShdPtr<Orv::DevMDPrtcl> device = host.getDevice(name);
     stream << name << "\nproperties\n";
-    if (const auto prtcl = Orv::RCShdPtr<Orv::DevMDPropertyPrtcl>::dynamicCast(device); !prtcl.isNull()) {
+    if (const auto prtcl = Orv::RCShdPtr<Orv::DevMDPropertyPrtcl>::dynamicCast(device);
+        !prtcl.isNull()) {
         describeProperties(prtcl->getPropertyIter(), "", stream);
         for (const auto& set : prtcl->getPropertySetIter()) {
-            describeProperties(set->getPropertyIter(), std::string(set->getName().getText()) + ':', stream);
+            describeProperties(set->getPropertyIter(), std::string(set->getName().getText()) + ':',
+                               stream);
         }
     }
     stream << "streams\n";
-    if (const auto prtcl = Orv::RCShdPtr<Orv::DevMDStreamPrtcl>::dynamicCast(device); !prtcl.isNull()) {
+    if (const auto prtcl = Orv::RCShdPtr<Orv::DevMDStreamPrtcl>::dynamicCast(device);
+        !prtcl.isNull()) {
         for (const auto& end : prtcl->performGetStreams()) {
             const bool isSource = !Orv::RCShdPtr<Orv::DevMDStreamSource>::dynamicCast(end).isNull();
             stream << "  " << std::left << std::setw(26) << end->getName().getChars()
@@ -249,16 +259,17 @@ void describeDevice(Host& host, const std::string& name, std::ostream& stream) {
 void writeGraph(Host& host, std::ostream& stream) {
     stream << "digraph mediahost {\n  rankdir=LR;\n  node [shape=box, style=rounded];\n";
     for (const Pipeline::Device& device : host.getPipeline().devices) {
-        stream << "  " << quote(device.name) << " [label=" << quote(device.name + "\\n" + device.kind)
-               << "];\n";
+        stream << "  " << quote(device.name)
+               << " [label=" << quote(device.name + "\\n" + device.kind) << "];\n";
     }
     for (const std::string& connection : host.getConnections()) {
         const std::string source = connection.substr(0, connection.find(':'));
         const std::size_t second = connection.rfind(' ') + 1;
         const std::string sink = connection.substr(second, connection.find(':', second) - second);
-        const std::string label = connection.substr(connection.find(':') + 1,
-                                                    connection.find(' ') - connection.find(':') - 1);
-        stream << "  " << quote(source) << " -> " << quote(sink) << " [label=" << quote(label) << "];\n";
+        const std::string label = connection.substr(
+            connection.find(':') + 1, connection.find(' ') - connection.find(':') - 1);
+        stream << "  " << quote(source) << " -> " << quote(sink) << " [label=" << quote(label)
+               << "];\n";
     }
     // The sequence: who leads whom.
     std::vector<std::string> leaders;

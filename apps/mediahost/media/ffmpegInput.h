@@ -17,7 +17,8 @@ struct FfmpegDeleter {
 };
 using FfmpegFormat =
     std::unique_ptr<AVFormatContext, FfmpegDeleter<AVFormatContext, avformat_close_input>>;
-using FfmpegCodec = std::unique_ptr<AVCodecContext, FfmpegDeleter<AVCodecContext, avcodec_free_context>>;
+using FfmpegCodec =
+    std::unique_ptr<AVCodecContext, FfmpegDeleter<AVCodecContext, avcodec_free_context>>;
 using FfmpegFrame = std::unique_ptr<AVFrame, FfmpegDeleter<AVFrame, av_frame_free>>;
 using FfmpegPacket = std::unique_ptr<AVPacket, FfmpegDeleter<AVPacket, av_packet_free>>;
 
@@ -28,7 +29,6 @@ std::string describeFfmpegError(int code);
 /// - Threads: one at a time; decoding itself uses @p nbThreads.
 class FfmpegInput {
 public:
-
     /// An input for a stream of that kind, or null if the file has none.
     /// @param nbThreads  0: as many as the machine has processors.
     /// @throws MediaError if the file cannot be opened, is no media, or cannot be decoded.

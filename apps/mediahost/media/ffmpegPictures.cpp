@@ -18,7 +18,8 @@ namespace {
 // Of bytes all over the picture: enough to tell a picture from its neighbours, and quick.
 std::uint64_t takePrint(const AVFrame& frame) {
     constexpr int NB_ROWS = 16;
-    const int rowBytes = av_image_get_linesize(static_cast<AVPixelFormat>(frame.format), frame.width, 0);
+    const int rowBytes =
+        av_image_get_linesize(static_cast<AVPixelFormat>(frame.format), frame.width, 0);
     std::uint64_t print = 14695981039346656037ULL;
     for (int i = 0; i < NB_ROWS; ++i) {
         const std::ptrdiff_t row = static_cast<std::ptrdiff_t>(frame.height) * i / NB_ROWS;
@@ -82,9 +83,9 @@ bool FfmpegPictures::advance() {
 // Finds out which picture this is.
 bool FfmpegPictures::recall(const Known& seen) {
     if (_isLocating) {
-        const auto found =
-            std::lower_bound(_known.begin(), _known.end(), seen.timestamp,
-                             [](const Known& known, std::int64_t at) { return known.timestamp < at; });
+        const auto found = std::lower_bound(
+            _known.begin(), _known.end(), seen.timestamp,
+            [](const Known& known, std::int64_t at) { return known.timestamp < at; });
         if (found == _known.end() || found->timestamp != seen.timestamp) return false;
         const std::int64_t unit = found - _known.begin();
         if (unit > _wantedUnit) return seekEarlier();
@@ -166,8 +167,7 @@ bool FfmpegPictures::isSeekQuicker(std::int64_t unit) const {
 void FfmpegPictures::seek(std::int64_t unit) {
     const std::int64_t key = findKey(unit - _nbUnitsBefore);
     _wantedUnit = unit;
-    if (key > 0 && _isSeekable &&
-        _input->seek(_known[static_cast<std::size_t>(key)].timestamp)) {
+    if (key > 0 && _isSeekable && _input->seek(_known[static_cast<std::size_t>(key)].timestamp)) {
         _isLocating = true;
         _nextUnit = key;
     } else {

@@ -49,9 +49,9 @@ private:
     SwsContext* _scaler = nullptr;
     AVFrame* _frame = nullptr;  // the input's, or null
     std::vector<Known> _known;
-    bool _isComplete = false;    // _known is
-    bool _isSeekable = true;     // as far as is known
-    bool _isLocating = false;    // after a seek, until it is clear which picture has come
+    bool _isComplete = false;         // _known is
+    bool _isSeekable = true;          // as far as is known
+    bool _isLocating = false;         // after a seek, until it is clear which picture has come
     std::int64_t _wantedUnit = 0;     // of the latest seek
     std::int64_t _nbUnitsBefore = 0;  // so much earlier is sought
     std::int64_t _unit = -1;

@@ -35,8 +35,8 @@ bool FfmpegSound::next() {
     while (_waiting.size() < wanted && decodePiece()) {
     }
     if (_waiting.empty()) return false;
-    const auto end = _waiting.begin() +
-                     static_cast<std::ptrdiff_t>(std::min(wanted, _waiting.size()));
+    const auto end =
+        _waiting.begin() + static_cast<std::ptrdiff_t>(std::min(wanted, _waiting.size()));
     _block.assign(_waiting.begin(), end);
     _waiting.erase(_waiting.begin(), end);
     _unit = _nextUnit++;
@@ -70,7 +70,8 @@ bool FfmpegSound::decodePiece() {
     convert(*frame);
     const std::int64_t nbSamples =
         static_cast<std::int64_t>(_converted.size()) / _format.nbChannels;
-    const std::int64_t nbDropped = std::clamp<std::int64_t>(_wantedSample - _nextSample, 0, nbSamples);
+    const std::int64_t nbDropped =
+        std::clamp<std::int64_t>(_wantedSample - _nextSample, 0, nbSamples);
     _nextSample += nbSamples;
     _waiting.insert(_waiting.end(), _converted.begin() + nbDropped * _format.nbChannels,
                     _converted.end());
@@ -119,8 +120,8 @@ void FfmpegSound::convert(const AVFrame& frame) {
                       static_cast<std::size_t>(_format.nbChannels));
     auto* out = reinterpret_cast<std::uint8_t*>(_converted.data());
     const int nbSamples =
-        swr_convert(_converter, &out, room,
-                    const_cast<const std::uint8_t**>(frame.extended_data), frame.nb_samples);
+        swr_convert(_converter, &out, room, const_cast<const std::uint8_t**>(frame.extended_data),
+                    frame.nb_samples);
     if (nbSamples < 0) throw MediaError("sound cannot be converted");
     _converted.resize(static_cast<std::size_t>(nbSamples) *
                       static_cast<std::size_t>(_format.nbChannels));

@@ -49,9 +49,9 @@ private:
     std::int64_t _nextSample = 0;  // the first one of the next piece
     std::int64_t _nbSettling = 8;  // pieces decoded before those that are used
     bool _isLocating = false;
-    std::int64_t _wantedSample = 0;   // what comes earlier is dropped
-    std::vector<float> _waiting;      // decoded, from _nextUnit on
-    std::vector<float> _block;        // the one at hand
+    std::int64_t _wantedSample = 0;  // what comes earlier is dropped
+    std::vector<float> _waiting;     // decoded, from _nextUnit on
+    std::vector<float> _block;       // the one at hand
     std::vector<float> _converted;
     std::int64_t _unit = -1;
     std::int64_t _nextUnit = 0;

@@ -2,9 +2,8 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <string>
-
 #include <orv/rational.h>
+#include <string>
 
 namespace MediaHost {
 
@@ -31,7 +30,7 @@ inline constexpr int BLOCK_SAMPLES = 1024;
 
 /// What stands before the data in the buffer of every unit.
 struct alignas(64) UnitHeader {
-    double seconds = 0;      ///< When the unit begins, from the start of the track.
+    double seconds = 0;          ///< When the unit begins, from the start of the track.
     std::int32_t nbSamples = 0;  ///< Per channel; 0 for a picture.
 };
 

@@ -31,7 +31,8 @@ OutputFile::~OutputFile() {
 
 void OutputFile::check(const char* action) {
     if (_stream) return;
-    const std::string reason = errno != 0 ? std::generic_category().message(errno) : "unknown reason";
+    const std::string reason =
+        errno != 0 ? std::generic_category().message(errno) : "unknown reason";
     throw MediaError(std::string("cannot ") + action + " \"" + _path.string() + "\": " + reason);
 }
 

@@ -1,8 +1,7 @@
 // Without FFmpeg: only the simulated pictures are there to be scaled.
 
-#include <zlib.h>
-
 #include <cstdio>
+#include <zlib.h>
 
 #include "pictureTools.h"
 
@@ -28,8 +27,7 @@ void PictureScaler::scale(const PictureFormat& format, const std::byte* picture,
 }
 
 std::string getChecksum(const std::byte* data, std::size_t nbBytes) {
-    const uLong sum =
-        crc32_z(0, reinterpret_cast<const unsigned char*>(data), nbBytes);
+    const uLong sum = crc32_z(0, reinterpret_cast<const unsigned char*>(data), nbBytes);
     char text[16];
     std::snprintf(text, sizeof text, "crc32:%08lx", static_cast<unsigned long>(sum));
     return text;

@@ -1,10 +1,9 @@
 #include "pngFile.h"
 
-#include <zlib.h>
-
 #include <cstring>
 #include <string>
 #include <vector>
+#include <zlib.h>
 
 #include "mediaError.h"
 #include "outputFile.h"
@@ -53,7 +52,8 @@ void writePng(const std::filesystem::path& path, const RgbView& picture) {
     const Bytes rows = filterRows(picture);
     Bytes packed(compressBound(static_cast<uLong>(rows.size())));
     auto nbPacked = static_cast<uLongf>(packed.size());
-    if (compress2(packed.data(), &nbPacked, rows.data(), static_cast<uLong>(rows.size()), 6) != Z_OK) {
+    if (compress2(packed.data(), &nbPacked, rows.data(), static_cast<uLong>(rows.size()), 6) !=
+        Z_OK) {
         throw MediaError("cannot compress \"" + path.string() + '"');
     }
     packed.resize(nbPacked);

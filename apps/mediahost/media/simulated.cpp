@@ -88,8 +88,9 @@ void ToneSound::copy(void* unit) {
     for (std::int64_t i = 0; i < nbSamples; ++i) {
         // The phase within its second keeps its digits however long the tone is.
         const std::int64_t inSecond = (first + i) % _format.rate;
-        const double cycles = static_cast<double>(inSecond) * _hertz / _format.rate +
-                              static_cast<double>((first + i) / _format.rate) * std::fmod(_hertz, 1);
+        const double cycles =
+            static_cast<double>(inSecond) * _hertz / _format.rate +
+            static_cast<double>((first + i) / _format.rate) * std::fmod(_hertz, 1);
         const bool isClick = inSecond < _format.rate / 1000;
         const auto value = static_cast<float>(
             isClick ? 0.9 : 0.25 * std::sin(2 * std::numbers::pi * (cycles - std::floor(cycles))));

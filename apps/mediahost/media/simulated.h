@@ -1,9 +1,8 @@
 #pragma once
 
-#include <vector>
-
 #include <orv/liTimeCode.h>
 #include <orv/rcShdPtr.h>
+#include <vector>
 
 #include "unitDecoder.h"
 

@@ -1,14 +1,13 @@
 #include "track.h"
 
 #include <algorithm>
-#include <string>
-#include <vector>
-
 #include <orv/lkGuard.h>
 #include <orv/lkSema.h>
 #include <orv/mbProtocol.h>
 #include <orv/mtThreadFactory.h>
 #include <orv/mtThreadProtocol.h>
+#include <string>
+#include <vector>
 
 #include "mediaError.h"
 

@@ -6,7 +6,6 @@
 #include <map>
 #include <memory>
 #include <optional>
-
 #include <orv/lkAsyncHandle.h>
 #include <orv/lkCondVar.h>
 #include <orv/lkMutex.h>

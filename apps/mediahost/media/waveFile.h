@@ -19,7 +19,9 @@ public:
     void commit();
 
     const SoundFormat& getFormat() const { return _format; }
-    std::uint64_t getNbSamples() const { return _nbBytes / 2 / static_cast<unsigned>(_format.nbChannels); }
+    std::uint64_t getNbSamples() const {
+        return _nbBytes / 2 / static_cast<unsigned>(_format.nbChannels);
+    }
 
 private:
     const SoundFormat _format;
