@@ -51,7 +51,7 @@ ClockDevice::ClockDevice(const Orv::LiString& name, HostContext& context, Settin
 
 ClockDevice::~ClockDevice() noexcept(false) = default;
 
-void ClockDevice::sync(const Orv::DtTime&, Orv::DevMDSyncSeqRequest&) {
+void ClockDevice::syncTo(const Orv::DtTime&, Orv::DevMDSyncSeqRequest&) {
     if (getContext().isPaced) {
         beginBeating();
     } else {

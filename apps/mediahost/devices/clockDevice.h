@@ -17,7 +17,7 @@ public:
     ~ClockDevice() noexcept(false) override;
 
 protected:
-    void sync(const Orv::DtTime& time, Orv::DevMDSyncSeqRequest& request) override;
+    void syncTo(const Orv::DtTime& time, Orv::DevMDSyncSeqRequest& request) override;
     void stop(Orv::DevMDSyncSeqRequest& request) override;
     void abort(Orv::DevMDSyncSeqRequest& request) override;
     void close() override;
