@@ -130,13 +130,14 @@ const bool isRegistered = [] {
     }
     for (const auto& file : files) registerClip(file);
     // Twice, since what is reported are medians.
-    for (const auto& [name, function] : {std::pair{"paced 1080p60 60 s/orv-mediahost", playPaced},
-                                         std::pair{"paced 1080p60 60 s/limit", showLimits}}) {
+    const auto addPaced = [](const char* name, void (*function)(benchmark::State&)) {
         benchmark::RegisterBenchmark(name, function)
             ->UseManualTime()
             ->Iterations(1)
             ->Repetitions(2);
-    }
+    };
+    addPaced("paced 1080p60 60 s/orv-mediahost", playPaced);
+    addPaced("paced 1080p60 60 s/limit", showLimits);
     return true;
 }();
 
