@@ -107,7 +107,12 @@ public:
     /// The parent of each node, -1 for a leader; parents first.
     using Shape = std::vector<int>;
 
-    explicit DevSeqWorld(const Shape& shape) : fifo(new DevMgrFifo(0)), tree(new DevSeqTree(fifo)) {
+    explicit DevSeqWorld(const Shape& shape)
+        : DevSeqWorld(shape, RCShdPtr<DevMgrFifo>(new DevMgrFifo(0))) {}
+
+    /// @param fifo_  empty; left empty at the end.
+    DevSeqWorld(const Shape& shape, const RCShdPtr<DevMgrFifo>& fifo_)
+        : fifo(fifo_), tree(new DevSeqTree(fifo)) {
         std::vector<DevSeqTree::Edge> edges;
         for (std::size_t i = 0; i < shape.size(); ++i) {
             devices.emplace_back(new DevSeqSimDevice);
@@ -121,7 +126,7 @@ public:
     }
     ~DevSeqWorld() {
         tree->close();
-        fifo->close(false);
+        if (!fifo->isClosed()) deliverAll();
     }
     DevSeqWorld(const DevSeqWorld&) = delete;
     DevSeqWorld& operator=(const DevSeqWorld&) = delete;

@@ -13,7 +13,7 @@ DevSeqAbortedSema::~DevSeqAbortedSema() noexcept(false) = default;
 
 LiString DevSeqAbortedSema::getName() {
     static std::atomic<unsigned long> serial{0};
-    const LkGuard guard(_mutex);
+    const LkGuard guard(_lock);
     if (_sema != nullptr) return _name;
     _name =
         LiString(formatText("orv-sequence-%ld-%lu", LkNamedMutexNative::getProcessId(), ++serial));
@@ -25,7 +25,7 @@ LiString DevSeqAbortedSema::getName() {
 }
 
 void DevSeqAbortedSema::post() {
-    const LkGuard guard(_mutex);
+    const LkGuard guard(_lock);
     if (std::exchange(_isPosted, true)) return;
     if (_sema != nullptr) _sema->post();
 }

@@ -3,7 +3,7 @@
 #include <memory>
 
 #include "liString.h"
-#include "lkMutex.h"
+#include "lkLock.h"
 #include "lkNamedSema.h"
 
 namespace Orv {
@@ -30,10 +30,10 @@ public:
     void post();  ///< Once.
 
 private:
-    LkMutex _mutex{"DevSeqAbortedSema"};
-    bool _isPosted ORV_GUARDED_BY(_mutex) = false;
-    LiString _name ORV_GUARDED_BY(_mutex);
-    std::unique_ptr<LkNamedSema> _sema ORV_GUARDED_BY(_mutex);  // null until asked for
+    LkLock _lock{"DevSeqAbortedSema"};
+    bool _isPosted ORV_GUARDED_BY(_lock) = false;
+    LiString _name ORV_GUARDED_BY(_lock);
+    std::unique_ptr<LkNamedSema> _sema ORV_GUARDED_BY(_lock);  // null until asked for
 };
 
 }  // namespace Orv

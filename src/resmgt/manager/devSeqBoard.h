@@ -6,8 +6,8 @@
 #include "devSeqState.h"
 #include "devWaitGraph.h"
 #include "liString.h"
-#include "lkCondVar.h"
-#include "lkMutex.h"
+#include "lkLock.h"
+#include "lkSema.h"
 #include "resmgtApi.h"
 
 namespace Orv {
@@ -16,7 +16,7 @@ namespace Orv {
 /// between steps only, so nobody sees a tree that is half-way through one.
 ///
 /// - Threads: any.
-class ORV_RESMGT_API DevSeqBoard : private DevWaitGraph::Breaker {
+class ORV_RESMGT_API DevSeqBoard final : private DevWaitGraph::Breaker {
 public:
     struct Change {
         unsigned node;
@@ -36,7 +36,7 @@ public:
 
     void publish(const std::vector<Change>& changes);  ///< In their order; all at one moment.
     void fail(unsigned node, const LiString& why);     ///< The first reason is kept.
-    void end() noexcept;                               ///< Nothing will be published any more.
+    void end();                                        ///< Nothing will be published any more.
 
     DevSeqState getState(unsigned node) const;
     LiString getFailure(unsigned node) const;  ///< Empty if it has not failed.
@@ -56,21 +56,21 @@ private:
     };
     struct Waiter {
         DevSeqState state;
-        Outcome outcome;
+        Outcome outcome = Outcome::PENDING;  // guarded by the lock
+        LkSema told{"DevSeqBoard", 0};
     };
 
     DevWaitGraph::Target& _manager;
-    mutable LkMutex _mutex{"DevSeqBoard"};
-    LkCondVar _changed{"DevSeqBoard"};
-    std::vector<Node> _nodes ORV_GUARDED_BY(_mutex);
-    std::uint32_t _nbIn[NB_DEV_SEQ_STATES] ORV_GUARDED_BY(_mutex) = {};  // of those that take part
-    std::uint32_t _nbLinked ORV_GUARDED_BY(_mutex) = 0;
-    bool _hasFailed ORV_GUARDED_BY(_mutex) = false;
-    std::vector<Waiter*> _waiters ORV_GUARDED_BY(_mutex);
+    mutable LkLock _lock{"DevSeqBoard"};
+    std::vector<Node> _nodes ORV_GUARDED_BY(_lock);
+    std::uint32_t _nbIn[NB_DEV_SEQ_STATES] ORV_GUARDED_BY(_lock) = {};  // of those that take part
+    std::uint32_t _nbLinked ORV_GUARDED_BY(_lock) = 0;
+    bool _hasFailed ORV_GUARDED_BY(_lock) = false;
+    std::vector<Waiter*> _waiters ORV_GUARDED_BY(_lock);
 
-    std::uint32_t& countOf(DevSeqState state) ORV_REQUIRES(_mutex);
-    Outcome judge(DevSeqState state) ORV_REQUIRES(_mutex);
-    void tellWaiters() noexcept ORV_REQUIRES(_mutex);
+    std::uint32_t& countOf(DevSeqState state) ORV_REQUIRES(_lock);
+    Outcome judge(DevSeqState state) ORV_REQUIRES(_lock);
+    void tellWaiters() ORV_REQUIRES(_lock);
     void await(Waiter& waiter, const DevWaitGraph::Wait& wait, double seconds);
     void letGo() override;
 };

@@ -23,21 +23,13 @@ Claimed& getClaimed() {
 bool DevSeqClaims::add(const Devices& devices) {
     Claimed& claimed = getClaimed();
     const LkGuard guard(claimed.lock);
-    std::size_t nbAdded = 0;
-    const auto undo = [&] {
-        while (nbAdded > 0) claimed.devices.erase(devices[--nbAdded]);
-    };
-    try {
-        while (nbAdded < devices.size() && claimed.devices.insert(devices[nbAdded]).second) {
-            ++nbAdded;
-        }
-    } catch (...) {
-        undo();
-        throw;
+    claimed.devices.reserve(claimed.devices.size() + devices.size());
+    for (const DevMDPrtcl* const device : devices) {
+        if (claimed.devices.contains(device)) return false;
     }
-    if (nbAdded == devices.size()) return true;
-    undo();
-    return false;
+    std::unordered_set<const DevMDPrtcl*> added(devices.begin(), devices.end());
+    claimed.devices.merge(added);  // moves what is there already: it cannot fail half-way
+    return true;
 }
 
 void DevSeqClaims::remove(const DevMDPrtcl& device) noexcept {
