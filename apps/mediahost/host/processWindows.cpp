@@ -1,6 +1,8 @@
 #include <io.h>
-#include <psapi.h>
+// clang-format off: psapi.h needs what windows.h defines
 #include <windows.h>
+#include <psapi.h>
+// clang-format on
 
 #include "process.h"
 
