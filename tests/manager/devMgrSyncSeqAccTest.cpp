@@ -21,21 +21,21 @@ const std::vector<std::string> NAMES = {"clock", "deckA", "deckB", "fx"};
 
 /// What the devices of a test do, and have done.
 struct Script {
-    std::map<std::string, std::function<void(DevMDSyncSeqRequest&)>> actions;  // "deckA:sync"
+    std::map<std::string, std::function<void()>> actions;  // "deckA:sync"
     std::map<std::string, DevMDSyncSeqSignals> signals;
     std::function<void(const std::string&, const DevMDSyncSeqSignals&)> onStart =
         [](const std::string&, const DevMDSyncSeqSignals& own) { own.ready(); };
     std::mutex mutex;
     std::vector<std::string> journal;
 
-    void perform(const LiString& name, const char* action, DevMDSyncSeqRequest* request) {
+    void perform(const LiString& name, const char* action) {
         const std::string what = std::string(name.getText()) + ":" + action;
         {
             const std::lock_guard guard(mutex);
             journal.push_back(what);
         }
         const auto found = actions.find(what);
-        if (found != actions.end()) found->second(*request);
+        if (found != actions.end()) found->second();
     }
     int count(const std::string& what) {
         const std::lock_guard guard(mutex);
@@ -54,28 +54,22 @@ public:
 
 protected:
     void start(const DevMDSyncSeqSignals& signals) override {
-        _script.perform(getName(), "start", nullptr);
+        _script.perform(getName(), "start");
         {
             const std::lock_guard guard(_script.mutex);
             _script.signals[std::string(getName().getText())] = signals;
         }
         _script.onStart(std::string(getName().getText()), signals);
     }
-    void syncTo(const DtTime&, DevMDSyncSeqRequest& request) override {
-        _script.perform(getName(), "sync", &request);
+    void syncTo(const DtTime&, DevMDSyncSeqRequest&) override {
+        _script.perform(getName(), "sync");
     }
-    void syncAt(const DtTimeMark&, DevMDSyncSeqRequest& request) override {
-        _script.perform(getName(), "sync", &request);
+    void syncAt(const DtTimeMark&, DevMDSyncSeqRequest&) override {
+        _script.perform(getName(), "sync");
     }
-    void stop(DevMDSyncSeqRequest& request) override {
-        _script.perform(getName(), "stop", &request);
-    }
-    void abort(DevMDSyncSeqRequest& request) override {
-        _script.perform(getName(), "abort", &request);
-    }
-    void recover(DevMDSyncSeqRequest& request) override {
-        _script.perform(getName(), "recover", &request);
-    }
+    void stop(DevMDSyncSeqRequest&) override { _script.perform(getName(), "stop"); }
+    void abort(DevMDSyncSeqRequest&) override { _script.perform(getName(), "abort"); }
+    void recover(DevMDSyncSeqRequest&) override { _script.perform(getName(), "recover"); }
 
 private:
     Script& _script;
@@ -230,7 +224,7 @@ TEST_F(DevMgrSyncSeqAccTest, refusesADeviceThatIsInAnotherRunningSequence) {
 
 TEST_F(DevMgrSyncSeqAccTest, isHeldUpNeitherByADeviceThatHangsNorByOneThatIsNeverReady) {
     Gate gate;
-    script.actions["deckA:sync"] = [&](auto&) { gate.wait(); };
+    script.actions["deckA:sync"] = [&] { gate.wait(); };
     script.onStart = [](const std::string& name, const DevMDSyncSeqSignals& signals) {
         if (name != "fx") signals.ready();
     };
@@ -264,9 +258,7 @@ TEST_F(DevMgrSyncSeqAccTest, abortsAllOthersWhenADeviceThrows) {
         {"recover", "The device dropped the request \"recover\"."}};
     for (const auto& [action, failure] : cases) {
         script.actions.clear();
-        script.actions["deckB:" + action] = [](auto&) {
-            throw std::runtime_error("no tape");
-        };
+        script.actions["deckB:" + action] = [] { throw std::runtime_error("no tape"); };
         acc = manager->createSyncSeqAcc();
         acc->configure(TREE);
         acc->start();

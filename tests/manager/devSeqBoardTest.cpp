@@ -21,11 +21,10 @@ protected:
         board.link(1);  // the third takes no part
     }
 
-    /// Waits in a thread of its own, which has begun to wait, or not, when this returns.
+    /// Waits in a thread of its own.
     template <class Check>
     std::thread waitFor(State state, Check check) {
         return std::thread([this, state, check] {
-            started.add();
             check([&] { return board.waitFor(state, getWaitLimitSeconds()); });
         });
     }
@@ -59,34 +58,27 @@ TEST_F(DevSeqBoardTest, tellsEveryWaiterOfAMomentThatHasPassedWhenItWakes) {
     for (const State state : {State::LOCK, State::LOCK, State::FINAL}) {
         threads.push_back(waitFor(state, isTrue));
     }
-    std::atomic<bool> isOver{false};
-    started.waitFor(3);
-    // Whenever a waiter comes: some round of these lies before it.
-    std::thread steps([&] {
-        while (!isOver) {
-            board.publish({{0, State::LOCK}, {1, State::LOCK}});
-            board.publish({{0, State::RECOVER}});
-        }
-    });
+    eventually("all wait", [&] { return board.getNbWaiting() == 3; });
+    board.publish({{0, State::LOCK}, {1, State::LOCK}});
+    board.publish({{0, State::RECOVER}});
     threads[0].join();
     threads[1].join();
-    isOver = true;
-    steps.join();
     board.publish({{0, State::FINAL}, {1, State::FINAL}});
     threads[2].join();
+    EXPECT_EQ(board.getNbWaiting(), 0u);
 }
 
 TEST_F(DevSeqBoardTest, endsWaitsForWhatCannotComeAnyMore) {
     // A node has ended, and will never be in step.
     std::thread first = waitFor(State::LOCK, expectImpossible);
-    started.waitFor(1);
+    eventually("it waits", [&] { return board.getNbWaiting() == 1; });
     board.publish({{1, State::STOP}, {1, State::FINAL}});
     first.join();
     expectImpossible([&] { return board.waitFor(State::WSS, 0); });
     EXPECT_FALSE(board.waitFor(State::FINAL, 0)) << "that may come";
     // A node has failed.
     std::thread second = waitFor(State::FINAL, expectImpossible);
-    started.waitFor(2);
+    eventually("it waits", [&] { return board.getNbWaiting() == 1; });
     board.fail(0, "first");
     board.fail(0, "second");
     board.publish({{0, State::EXCEPTION}});
@@ -98,7 +90,7 @@ TEST_F(DevSeqBoardTest, endsWaitsForWhatCannotComeAnyMore) {
 
 TEST_F(DevSeqBoardTest, endsWaitsWhenNothingWillBePublishedAnyMore) {
     std::thread thread = waitFor(State::LOCK, expectImpossible);
-    started.waitFor(1);
+    eventually("it waits", [&] { return board.getNbWaiting() == 1; });
     board.end();
     thread.join();
     EXPECT_TRUE(board.waitFor(State::INIT, 0)) << "what is, is";

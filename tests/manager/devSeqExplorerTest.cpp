@@ -400,8 +400,8 @@ struct Trees {
 const Trees trees[] = {{"one", {-1}},         {"pair", {-1, 0}},    {"two", {-1, -1}},
                        {"chain", {-1, 0, 1}}, {"fork", {-1, 0, 0}}, {"pairAndOne", {-1, 0, -1}}};
 
-/// How much is explored: -1 where locks are calls of a system that is slow at them, 0 under
-/// sanitizers, 1 in a run of all tests, 2 and more where there is time.
+/// How much is explored: -1 where locks are slow calls of the system, 0 under sanitizers, 1 in a run
+/// of all tests, 2 and more where there is time.
 int getWidth() {
     constexpr bool isWindows = std::filesystem::path::preferred_separator != '/';
     const int standard = isWindows ? -1 : getTestLimitSeconds() > 60 ? 0 : 1;
@@ -420,7 +420,7 @@ protected:
         return explorer.getRests();
     }
     static bool atWidth(int width) { return getWidth() >= width; }
-    bool isSmall() const { return GetParam().shape.size() < (atWidth(0) ? 3U : 2U); }
+    bool isSmall() const { return GetParam().shape.size() < (atWidth(1) ? 3U : 2U); }
     /// Is there no time for this one?
     bool isTooLarge() const { return GetParam().shape.size() > 2 && !atWidth(0); }
     std::string allIn(const std::string& state) const {
@@ -440,7 +440,7 @@ TEST_P(DevSeqExplorer, startsLocksAndStops) {
     Budget budget;
     budget.sync = atWidth(1) ? 2 : 1;
     budget.stop = atWidth(1) ? 2 : 1;
-    budget.abort = atWidth(2) ? 2 : isSmall() || atWidth(0);
+    budget.abort = atWidth(2) ? 2 : isSmall() || atWidth(1);
     budget.readyAgain = atWidth(1);
     const std::set<std::string> rests = explore(budget);
     for (const char* const state : {"init", "ready", "lock", "final"}) {
@@ -469,7 +469,7 @@ TEST_P(DevSeqExplorer, survivesADeviceThatDropsACommand) {
     budget.abort = isSmall() || atWidth(2);
     budget.drop = atWidth(2) ? 2 : 1;
     budget.recover = isSmall() || atWidth(2);
-    budget.lockLost = 1;
+    budget.lockLost = isSmall() || atWidth(1);
     EXPECT_TRUE(explore(budget).contains(allIn("final")));
 }
 

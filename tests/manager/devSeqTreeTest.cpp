@@ -203,6 +203,16 @@ TEST(DevSeqTree, abortsAllOthersWhenADeviceDiesAtAnyMoment) {
     }
 }
 
+TEST(DevSeqTree, isDoneAtOnceWithADeviceThatIsGoneWhenItAborts) {
+    DevSeqWorld world({-1});
+    lock(world);
+    world.devices[0]->die();
+    world.deliverAll();
+    world.post(DevSeqCommand::ABORT);
+    world.deliver();
+    EXPECT_EQ(world.getStates(), "final") << "no report is needed";
+}
+
 TEST(DevSeqTree, failsWhenADeviceDropsWhatItWasToDo) {
     struct Case {
         Kind kind;

@@ -64,6 +64,11 @@ bool DevSeqBoard::hasFailed() const {
     return _hasFailed;
 }
 
+std::size_t DevSeqBoard::getNbWaiting() const {
+    const LkGuard guard(_lock);
+    return _waiters.size();
+}
+
 DevSeqBoard::Outcome DevSeqBoard::judge(DevSeqState state) {
     if (countOf(state) == _nbLinked) return Outcome::REACHED;
     const bool hasEnded = state != DevSeqState::FINAL && countOf(DevSeqState::FINAL) > 0;

@@ -41,6 +41,7 @@ public:
     DevSeqState getState(unsigned node) const;
     LiString getFailure(unsigned node) const;  ///< Empty if it has not failed.
     bool hasFailed() const;                    ///< Has any node, or the whole?
+    std::size_t getNbWaiting() const;          ///< Threads in waitFor(); a snapshot.
 
     /// @return false if the time ran out before all nodes that take part were in the state together.
     /// @throws DevMgrEx::SMExecutionError if they never will be: one has failed, or ended elsewhere;
