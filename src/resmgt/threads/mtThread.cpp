@@ -137,8 +137,7 @@ void MtThread::stopAndJoin() noexcept {
     } catch (...) {
         Assertions::traceCurrentException("destroying a thread that runs");
     }
-    const LkGuard guard(_lock);
-    traceThrownNoLock();
+    traceThrown();
 }
 
 void MtThread::giveProtocolBack() noexcept {
@@ -157,11 +156,15 @@ void MtThread::start() {
     LkGuard guard(_lock);
     ORV_ASSERT(!isRunningNoLock());
     ORV_ASSERT(canStart());
-    traceThrownNoLock();
+    traceThrown();
     ++_run;
-    _hasEnded = _isForced = _isLevelRefused = false;
+    _isForced = _isLevelRefused = false;
+    {
+        const LkGuard endGuard(_endLock);
+        _hasEnded = false;
+    }
     _native->create(_stackSize, execute, this);
-    _started.wait();
+    waitForEntry();
     if (_startError) {
         static_cast<void>(_native->waitForEnd(LkTimeLimit()));
         _native->release();
@@ -171,6 +174,17 @@ void MtThread::start() {
     const LiString name = _name;
     guard.unlock();  // the body may destroy the object from here on
     traceRefusal(name);
+}
+
+/// A starter that gives way, while the new thread has only its processor to run on, finds it farther
+/// when it comes back; one that sleeps is woken by the handshake and pushes the thread aside again.
+void MtThread::waitForEntry() {
+    constexpr int nbYields = 2;
+    for (int i = 0; i < nbYields; ++i) {
+        if (_started.tryWait()) return;
+        MtUtil::yield();
+    }
+    _started.wait();
 }
 
 void MtThread::join() {
@@ -239,6 +253,7 @@ void MtThread::throwThrown(std::uint64_t run) {
     std::exception_ptr thrown;
     {
         const LkGuard guard(_lock);
+        const LkGuard endGuard(_endLock);
         if (_run != run || !_thrown) return;
         thrown = std::exchange(_thrown, nullptr);
     }
@@ -255,10 +270,15 @@ void MtThread::throwThrown(std::uint64_t run) {
 }
 
 /// What the last run threw, where nobody will join it any more.
-void MtThread::traceThrownNoLock() noexcept {
-    if (!_thrown) return;
+void MtThread::traceThrown() noexcept {
+    std::exception_ptr thrown;
+    {
+        const LkGuard endGuard(_endLock);
+        thrown = std::exchange(_thrown, nullptr);
+    }
+    if (!thrown) return;
     try {
-        std::rethrow_exception(std::exchange(_thrown, nullptr));
+        std::rethrow_exception(thrown);
     } catch (...) {
         Assertions::traceCurrentException("running a thread that nobody joined");
     }
@@ -353,7 +373,7 @@ void MtThread::end(const std::exception_ptr& thrown) {
         TraceManager::getInstance().flush();
         std::abort();
     }
-    const LkGuard guard(_lock);
+    const LkGuard endGuard(_endLock);
     _thrown = thrown;
     _hasEnded = true;
     _native->leave();
@@ -425,9 +445,10 @@ bool MtThread::tryForceStop() {
     const LkRecLock& dataLock = MtSpecificDataRegistry::getInstance().getLock();
     bool isStopped = false;
     _native->suspend();
-    if (!listLock.isLocked() && !_lock.isLocked() && !dataLock.isLocked()) {
+    if (!listLock.isLocked() && !_lock.isLocked() && !_endLock.isLocked() && !dataLock.isLocked()) {
         const LkGuard listGuard(listLock);
         const LkGuard guard(_lock);
+        const LkGuard endGuard(_endLock);
         const LkGuard dataGuard(dataLock);
         if (!_hasEnded && !_isForced) _isForced = _native->terminate();
         isStopped = _hasEnded || _isForced;
@@ -452,6 +473,7 @@ void MtThread::setPriorityLevel(int level) {
 
 int MtThread::getPriorityLevel() const {
     const LkGuard guard(_lock);
+    const LkGuard endGuard(_endLock);
     return isAliveNoLock() ? _native->readLevel(_level) : _level;
 }
 
@@ -482,12 +504,14 @@ void MtThread::followPriority(int level) {
 
 /// @return false if the system refuses the level.
 bool MtThread::applyLevelNoLock() {
+    const LkGuard endGuard(_endLock);
     return !isAliveNoLock() || _native->applyLevel(_level, MtThreadMgr::get().isRealTime());
 }
 
 /// @return whether the thread is in that class now; true if it does not run.
 bool MtThread::applyClass(bool isRealTime) {
     const LkGuard guard(_lock);
+    const LkGuard endGuard(_endLock);
     if (!isAliveNoLock()) return true;
     static_cast<void>(_native->applyLevel(_level, isRealTime));
     return _native->isRealTime() == isRealTime;
@@ -496,6 +520,7 @@ bool MtThread::applyClass(bool isRealTime) {
 void MtThread::setProcessorNb(int number) {
     const LkGuard guard(_lock);
     _processorNb = number;
+    const LkGuard endGuard(_endLock);
     if (!isProcessorPlaceable(number) || !isAliveNoLock()) return;
     _native->setProcessor(number);
     LkAdaptiveWait::forgetPlacement();
@@ -520,6 +545,7 @@ LkThreadId MtThread::getThreadId() const {
 
 void MtThread::dump(std::ostream& stream) const {
     const LkGuard guard(_lock);
+    const LkGuard endGuard(_endLock);
     stream << _name << " prio " << getPriorityLevel() << " NTprio " << getBasePriority()
            << " pol RR SYSTEM ex? " << (_thrown ? describe(_thrown) : "no exception") << " runon "
            << _processorNb << '\n';
