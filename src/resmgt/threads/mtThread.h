@@ -183,6 +183,7 @@ private:
     void followPriority(int level);
     bool applyLevelNoLock() ORV_REQUIRES(_lock);
     bool applyClass(bool isRealTime);
+    static void traceLevelRefusal(const LiString& thread);
 };
 
 }  // namespace Orv
