@@ -1,11 +1,32 @@
 #include "mtEx.h"
 
+#include "currentException.h"
+
 namespace Orv {
 
 MtEx::MtEx(const char* file, int line) : ExBase(file, line), std::runtime_error("") {}
 
 const char* MtEx::what() const noexcept {
     return getReason();
+}
+
+void MtEx::throwThrown(const char* file, int line, const char* thread,
+                       const std::exception_ptr& thrown) {
+    try {
+        std::rethrow_exception(thrown);
+    } catch (const ExBase& exception) {
+        throw ExThrownException(file, line, thread, exception);
+    } catch (...) {
+        throw ExStdThrownException(file, line, thread, describeCurrentException(), thrown);
+    }
+}
+
+std::string MtEx::describe(const std::exception_ptr& thrown) {
+    try {
+        std::rethrow_exception(thrown);
+    } catch (...) {
+        return describeCurrentException();
+    }
 }
 
 MtEx::ExRealTimeNotEnabled::ExRealTimeNotEnabled(const char* file, int line,

@@ -21,6 +21,13 @@ public:
 
     const char* what() const noexcept override;
 
+    /// Throws what the body of a thread threw, as one of the two classes for that.
+    [[noreturn]] static void throwThrown(const char* file, int line, const char* thread,
+                                         const std::exception_ptr& thrown);
+
+    /// What an exception says, or its type.
+    static std::string describe(const std::exception_ptr& thrown);
+
 protected:
     MtEx(const char* file, int line);
 };

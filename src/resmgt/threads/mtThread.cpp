@@ -2,18 +2,13 @@
 
 #include <cstdlib>
 #include <cxxabi.h>
-#include <optional>
 #include <ostream>
 #include <utility>
 
 #include "assertions.h"
-#include "currentException.h"
-#include "envIntVar.h"
 #include "lgRegistry.h"
-#include "lkAdaptiveWait.h"
 #include "mtEx.h"
 #include "mtNative.h"
-#include "mtPriorityMgr.h"
 #include "mtSpecificDataRegistry.h"
 #include "mtThreadGroup.h"
 #include "mtThreadLevels.h"
@@ -54,24 +49,8 @@ struct MtThread::Frame {
 namespace {
 
 std::atomic<bool> isStartAllowed{false};
-std::atomic<bool> isRefusalTraced{false};
 
 constexpr double LONGEST_FORCED_STOP_SECONDS = 1.0;
-
-void traceRefusal(const LiString& thread) {
-    if (isRefusalTraced.exchange(true, std::memory_order_relaxed)) return;
-    ORV_TRACE(TraceLevel::getMain()) << "The system refuses thread \"" << thread
-                                     << "\" its level for want of rights; it runs at a lower one. "
-                                        "Further refusals are not told.";
-}
-
-std::string describe(const std::exception_ptr& thrown) {
-    try {
-        std::rethrow_exception(thrown);
-    } catch (...) {
-        return describeCurrentException();
-    }
-}
 
 }  // namespace
 
@@ -137,8 +116,7 @@ void MtThread::stopAndJoin() noexcept {
     } catch (...) {
         Assertions::traceCurrentException("destroying a thread that runs");
     }
-    const LkGuard guard(_lock);
-    traceThrownNoLock();
+    traceThrown();
 }
 
 void MtThread::giveProtocolBack() noexcept {
@@ -157,11 +135,15 @@ void MtThread::start() {
     LkGuard guard(_lock);
     ORV_ASSERT(!isRunningNoLock());
     ORV_ASSERT(canStart());
-    traceThrownNoLock();
+    traceThrown();
     ++_run;
-    _hasEnded = _isForced = _isLevelRefused = false;
+    _isForced = _isLevelRefused = false;
+    {
+        const LkGuard endGuard(_endLock);
+        _hasEnded = false;
+    }
     _native->create(_stackSize, execute, this);
-    _started.wait();
+    waitForEntry();
     if (_startError) {
         static_cast<void>(_native->waitForEnd(LkTimeLimit()));
         _native->release();
@@ -170,7 +152,18 @@ void MtThread::start() {
     if (!_isLevelRefused) return;
     const LiString name = _name;
     guard.unlock();  // the body may destroy the object from here on
-    traceRefusal(name);
+    traceLevelRefusal(name);
+}
+
+/// A starter that gives way, while the new thread has only its processor to run on, finds it farther
+/// when it comes back; one that sleeps is woken by the handshake and pushes the thread aside again.
+void MtThread::waitForEntry() {
+    constexpr int nbYields = 2;
+    for (int i = 0; i < nbYields; ++i) {
+        if (_started.tryWait()) return;
+        MtUtil::yield();
+    }
+    _started.wait();
 }
 
 void MtThread::join() {
@@ -239,26 +232,25 @@ void MtThread::throwThrown(std::uint64_t run) {
     std::exception_ptr thrown;
     {
         const LkGuard guard(_lock);
+        const LkGuard endGuard(_endLock);
         if (_run != run || !_thrown) return;
         thrown = std::exchange(_thrown, nullptr);
     }
     ORV_TRACE(TraceLevel::getMain())
-        << "Thread \"" << _name << "\" ended with an exception: " << describe(thrown);
-    try {
-        std::rethrow_exception(thrown);
-    } catch (const ExBase& exception) {
-        throw MtEx::ExThrownException(ORV_FILE, __LINE__, _name.getChars(), exception);
-    } catch (...) {
-        throw MtEx::ExStdThrownException(ORV_FILE, __LINE__, _name.getChars(),
-                                         describeCurrentException(), thrown);
-    }
+        << "Thread \"" << _name << "\" ended with an exception: " << MtEx::describe(thrown);
+    MtEx::throwThrown(ORV_FILE, __LINE__, _name.getChars(), thrown);
 }
 
 /// What the last run threw, where nobody will join it any more.
-void MtThread::traceThrownNoLock() noexcept {
-    if (!_thrown) return;
+void MtThread::traceThrown() noexcept {
+    std::exception_ptr thrown;
+    {
+        const LkGuard endGuard(_endLock);
+        thrown = std::exchange(_thrown, nullptr);
+    }
+    if (!thrown) return;
     try {
-        std::rethrow_exception(std::exchange(_thrown, nullptr));
+        std::rethrow_exception(thrown);
     } catch (...) {
         Assertions::traceCurrentException("running a thread that nobody joined");
     }
@@ -309,13 +301,6 @@ bool MtThread::enter(Frame& frame) noexcept {
     return hasEntered;
 }
 
-void MtThread::placeAtStart() {
-    static EnvIntVar runOn("ORV_RUNON", 1);
-    if (_processorNb < 0 || _processorNb >= MtThreadMgr::get().getNbProcessors()) return;
-    runOn.refresh();
-    if (runOn.getValue() != 0) _native->setProcessor(_processorNb);
-}
-
 void MtThread::runBody(Frame& frame) {
     try {
         frame.attempt([&] {
@@ -341,7 +326,8 @@ void MtThread::finish(Frame& frame) {
         frame.thread->end(frame.thrown);
     } else if (frame.thrown) {
         ORV_TRACE(TraceLevel::getMain())
-            << "A thread whose object had gone ended with an exception: " << describe(frame.thrown);
+            << "A thread whose object had gone ended with an exception: "
+            << MtEx::describe(frame.thrown);
     }
 }
 
@@ -349,11 +335,11 @@ void MtThread::finish(Frame& frame) {
 void MtThread::end(const std::exception_ptr& thrown) {
     if (thrown && _terminatesOnUnhandled) {
         ORV_TRACE(TraceLevel::getMain()) << "Terminating on unhandled exception. Thread \"" << _name
-                                         << "\": " << describe(thrown);
+                                         << "\": " << MtEx::describe(thrown);
         TraceManager::getInstance().flush();
         std::abort();
     }
-    const LkGuard guard(_lock);
+    const LkGuard endGuard(_endLock);
     _thrown = thrown;
     _hasEnded = true;
     _native->leave();
@@ -425,90 +411,16 @@ bool MtThread::tryForceStop() {
     const LkRecLock& dataLock = MtSpecificDataRegistry::getInstance().getLock();
     bool isStopped = false;
     _native->suspend();
-    if (!listLock.isLocked() && !_lock.isLocked() && !dataLock.isLocked()) {
+    if (!listLock.isLocked() && !_lock.isLocked() && !_endLock.isLocked() && !dataLock.isLocked()) {
         const LkGuard listGuard(listLock);
         const LkGuard guard(_lock);
+        const LkGuard endGuard(_endLock);
         const LkGuard dataGuard(dataLock);
         if (!_hasEnded && !_isForced) _isForced = _native->terminate();
         isStopped = _hasEnded || _isForced;
     }
     _native->resume();
     return isStopped;
-}
-
-// Scheduling
-
-void MtThread::setPriorityLevel(int level) {
-    static_cast<void>(MtThreadLevels::toThreadPriority(level));  // which refuses all others
-    bool isApplied = true;
-    {
-        const LkGuard guard(_lock);
-        _isLevelByHand = true;
-        _level = level;
-        isApplied = applyLevelNoLock();
-    }
-    if (!isApplied) traceRefusal(_name);
-}
-
-int MtThread::getPriorityLevel() const {
-    const LkGuard guard(_lock);
-    return isAliveNoLock() ? _native->readLevel(_level) : _level;
-}
-
-int MtThread::getBasePriority() const {
-    return MtThreadLevels::toBasePriority(MtThreadMgr::get().imp().getProcessClass(),
-                                          getPriorityLevel());
-}
-
-/// Takes the level of the thread's priority, also while another thread is telling it a new one.
-void MtThread::followLevel() {
-    std::optional<int> level, before;
-    while ((level = MtPriorityMgr::getInstance().findLevel(_priority)) && level != before) {
-        followPriority(*level);
-        before = level;
-    }
-}
-
-void MtThread::followPriority(int level) {
-    bool isApplied = true;
-    {
-        const LkGuard guard(_lock);
-        if (_isLevelByHand || _level == level) return;
-        _level = level;
-        isApplied = applyLevelNoLock();
-    }
-    if (!isApplied) traceRefusal(_name);
-}
-
-/// @return false if the system refuses the level.
-bool MtThread::applyLevelNoLock() {
-    return !isAliveNoLock() || _native->applyLevel(_level, MtThreadMgr::get().isRealTime());
-}
-
-/// @return whether the thread is in that class now; true if it does not run.
-bool MtThread::applyClass(bool isRealTime) {
-    const LkGuard guard(_lock);
-    if (!isAliveNoLock()) return true;
-    static_cast<void>(_native->applyLevel(_level, isRealTime));
-    return _native->isRealTime() == isRealTime;
-}
-
-void MtThread::setProcessorNb(int number) {
-    const LkGuard guard(_lock);
-    _processorNb = number;
-    if (!isProcessorPlaceable(number) || !isAliveNoLock()) return;
-    _native->setProcessor(number);
-    LkAdaptiveWait::forgetPlacement();
-}
-
-int MtThread::getProcessorNb() const {
-    const LkGuard guard(_lock);
-    return _processorNb;
-}
-
-bool MtThread::isProcessorPlaceable(int number) const {
-    return MtThreadNative::IS_PLACEABLE && number >= ANY_PROCESSOR &&
-           number < MtThreadMgr::get().getNbProcessors();
 }
 
 // Queries
@@ -520,9 +432,10 @@ LkThreadId MtThread::getThreadId() const {
 
 void MtThread::dump(std::ostream& stream) const {
     const LkGuard guard(_lock);
+    const LkGuard endGuard(_endLock);
     stream << _name << " prio " << getPriorityLevel() << " NTprio " << getBasePriority()
-           << " pol RR SYSTEM ex? " << (_thrown ? describe(_thrown) : "no exception") << " runon "
-           << _processorNb << '\n';
+           << " pol RR SYSTEM ex? " << (_thrown ? MtEx::describe(_thrown) : "no exception")
+           << " runon " << _processorNb << '\n';
 }
 
 }  // namespace Orv

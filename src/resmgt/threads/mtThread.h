@@ -121,7 +121,7 @@ private:
     const bool _isMainThread;
     const bool _terminatesOnUnhandled;
     MtThreadGroup* const _group;  // or null
-    mutable LkRecLock _lock{"MtThreadWindows"};
+    const LkRecLock _lock{"MtThreadWindows"};
     LkUnnamedSema _started{"MtThreadWindows::started", 0};
     LkEvent _joinerLeft{"MtThreadWindows::joinerLeft", true};  // reset while somebody joins
     std::atomic<bool> _isRunning{false};
@@ -131,10 +131,8 @@ private:
 
     // Up to the handshake the new thread uses these in the name of its starter, who holds the lock.
     std::uint64_t _run ORV_GUARDED_BY(_lock) = 0;          // counts starts
-    std::exception_ptr _thrown ORV_GUARDED_BY(_lock);      // of the last run, until it was joined
     std::exception_ptr _startError;                        // of a run that did not reach its body
     std::uintptr_t _dataNumber ORV_GUARDED_BY(_lock) = 0;  // in MtSpecificDataRegistry
-    bool _hasEnded ORV_GUARDED_BY(_lock) = false;          // on its way out, though not joined
     bool _isForced ORV_GUARDED_BY(_lock) = false;
     bool _isBeingJoined ORV_GUARDED_BY(_lock) = false;
     bool _isCancelable ORV_GUARDED_BY(_lock) = false;
@@ -142,6 +140,12 @@ private:
     bool _isLevelRefused ORV_GUARDED_BY(_lock) = false;
     int _level ORV_GUARDED_BY(_lock) = MtThreadLevels::NORMAL_LEVEL;
     int _processorNb ORV_GUARDED_BY(_lock) = ANY_PROCESSOR;
+
+    // Taken by the thread when it leaves, which is not to wait for its starter. What is done with
+    // the system's thread is done under it.
+    const LkRecLock _endLock{"MtThread::endLock"};
+    std::exception_ptr _thrown ORV_GUARDED_BY(_endLock);  // of the last run, until it was joined
+    bool _hasEnded ORV_GUARDED_BY(_endLock) = false;      // on its way out, though not joined
 
     ObjPtr<MtThreadProtocol> _protocol;  // may be null
     MtThreadPriority _priority;
@@ -154,6 +158,7 @@ private:
     void stopAndJoin() noexcept;
     void giveProtocolBack() noexcept;
 
+    void waitForEntry();
     static MtThread* findCurrent() noexcept;
     static void execute(void* data);
     bool enter(Frame& frame) noexcept ORV_NO_THREAD_SAFETY_ANALYSIS;
@@ -163,7 +168,7 @@ private:
     void end(const std::exception_ptr& thrown);
 
     bool isRunningNoLock() const noexcept { return isRunning(); }
-    bool isAliveNoLock() const noexcept ORV_REQUIRES(_lock) {
+    bool isAliveNoLock() const noexcept ORV_REQUIRES(_lock, _endLock) {
         return isRunningNoLock() && !_hasEnded && !_isForced;
     }
     bool joinWithin(const LkTimeLimit& limit);
@@ -172,12 +177,13 @@ private:
     void noteEndNoLock() ORV_REQUIRES(_lock);
     bool tryForceStop();
     void throwThrown(std::uint64_t run);
-    void traceThrownNoLock() noexcept ORV_REQUIRES(_lock);
+    void traceThrown() noexcept;
 
     void followLevel();
     void followPriority(int level);
     bool applyLevelNoLock() ORV_REQUIRES(_lock);
     bool applyClass(bool isRealTime);
+    static void traceLevelRefusal(const LiString& thread);
 };
 
 }  // namespace Orv

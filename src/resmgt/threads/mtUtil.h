@@ -29,8 +29,8 @@ public:
     static void printSysConf();
     static void printSysConf(std::ostream&);
 
-    /// Keeps the process's memory, present and future, from being paged out, as far as the system
-    /// allows; what it refuses is traced.
+    /// Keeps the process's memory from being paged out, as far as the system allows: what there is,
+    /// and on Linux what comes. What it refuses is traced.
     static void lockProcessMemory();
     static void unlockProcessMemory();
 

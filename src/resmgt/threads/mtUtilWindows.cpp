@@ -37,20 +37,28 @@ int probe(HANDLE file, const char* byte) {
     return -1;
 }
 
-/// Locks the pages that the process has committed, region by region; false if any was refused.
-bool lockCommittedMemory() {
-    bool isAllLocked = true;
+/// Calls the action with each region of memory that the process has committed and may touch.
+template <class Action>
+void forEachRegion(Action action) {
     MEMORY_BASIC_INFORMATION region;
     const char* address = nullptr;
     while (::VirtualQuery(address, &region, sizeof region) == sizeof region) {
         constexpr DWORD untouchable = PAGE_NOACCESS | PAGE_GUARD;
-        if (region.State == MEM_COMMIT && (region.Protect & untouchable) == 0 &&
-            !::VirtualLock(region.BaseAddress, region.RegionSize)) {
-            isAllLocked = false;
+        if (region.State == MEM_COMMIT && (region.Protect & untouchable) == 0) {
+            action(region.BaseAddress, region.RegionSize);
         }
         address = static_cast<const char*>(region.BaseAddress) + region.RegionSize;
     }
-    return isAllLocked;
+}
+
+/// The system locks no more than fits into the least working set.
+void makeRoomForLocks() {
+    SIZE_T nbBytes = 0;
+    forEachRegion([&](void*, SIZE_T size) { nbBytes += size; });
+    SIZE_T least = 0;
+    SIZE_T most = 0;
+    if (!::GetProcessWorkingSetSize(::GetCurrentProcess(), &least, &most)) return;
+    ::SetProcessWorkingSetSize(::GetCurrentProcess(), least + nbBytes, most + nbBytes);
 }
 
 }  // namespace
@@ -78,11 +86,20 @@ int MtUtil::testWritable(const void* address, int length) {
     return result;
 }
 
+/// What is committed later is not locked: here that can only be asked for region by region.
 void MtUtil::lockProcessMemory() {
-    if (lockCommittedMemory()) return;
-    const int error = OsError::getLast();
+    makeRoomForLocks();
+    SIZE_T nbRefused = 0;
+    int error = 0;
+    forEachRegion([&](void* start, SIZE_T size) {
+        if (::VirtualLock(start, size)) return;
+        nbRefused += size;
+        error = OsError::getLast();
+    });
+    if (nbRefused == 0) return;
+    ORV_TRACE(TraceLevel::getMain()) << "Process memory not locked, not available under NT4.0.";
     ORV_TRACE(TraceLevel::getMain())
-        << "Process memory not locked, or not all of it: " << OsError::describe(error) << ".";
+        << "Not locked are " << nbRefused << " bytes: " << OsError::describe(error) << ".";
 }
 
 void MtUtil::unlockProcessMemory() {}
