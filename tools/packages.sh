@@ -4,8 +4,10 @@
 # shellcheck disable=SC2034  # used by ./dev
 {
   PACKAGES_BUILD=(g++ cmake ninja-build ccache libgtest-dev libgmock-dev libxml2-dev)
+  PACKAGES_MEDIAHOST=(ffmpeg libavformat-dev libavcodec-dev libswscale-dev libswresample-dev
+    libsdl2-dev libcli11-dev zlib1g-dev pkg-config)
   PACKAGES_CLANG=(clang-19 libclang-rt-19-dev llvm-19)
-  PACKAGES_WINDOWS=(g++-mingw-w64-x86-64-posix googletest wine64)
+  PACKAGES_WINDOWS=(g++-mingw-w64-x86-64-posix googletest libcli11-dev libz-mingw-w64-dev wine64)
   PACKAGES_BENCH=(libbenchmark-dev pkg-config python3 libabsl-dev libace-dev libboost-dev
     libboost-thread-dev libconcurrentqueue-dev libglib2.0-dev libpoco-dev libpugixml-dev libtbb-dev
     libxml2-dev qt6-base-dev)

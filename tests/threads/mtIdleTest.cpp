@@ -41,10 +41,7 @@ public:
     /// inside a task, one waits for that as a task may, and one has no work.
     void park() {
         _release = std::make_unique<Gate>();
-        _tag = _requests.acquireTag();
         _requests.incRequestCount(_tag);
-        _taskTag = _pool.getRequestMgr().acquireTag();
-        _helperTag = _pool.getRequestMgr().acquireTag();
         Gate isTaken;
         _pool.submit(_taskTag, [&isTaken, gate = _release.get()] {
             isTaken.open();
@@ -77,9 +74,6 @@ public:
         for (std::thread& waiter : _waiters) waiter.join();
         _waiters.clear();
         _pool.wait(_helperTag);
-        _requests.releaseTag(_tag);
-        _pool.getRequestMgr().releaseTag(_taskTag);
-        _pool.getRequestMgr().releaseTag(_helperTag);
     }
 
 private:
@@ -87,11 +81,11 @@ private:
     CountingCallback _callback;
     RCShdPtr<MtAlarmHandle> _alarm = MtAlarmHandle::create();
     MtRequestMgr _requests;
-    MtRequestTag _tag;
-    MtRequestTag _taskTag;
-    MtRequestTag _helperTag;
+    const MtRequestTag _tag = _requests.acquireTag();  // the same ones in each round
     MtAlarmManagerImp _emptyManager;
     MtTaskPool _pool{"idle", 3};
+    const MtRequestTag _taskTag = _pool.getRequestMgr().acquireTag();
+    const MtRequestTag _helperTag = _pool.getRequestMgr().acquireTag();
     ObjPtr<MtThread> _thread;
     std::vector<std::thread> _waiters;
     int _nbRounds = 0;

@@ -241,22 +241,30 @@ TEST(MtThreadPool, theWorkersFollowThePoolsPriority) {
 /// Forgets to stop.
 class CarelessPool : public MtThreadPool {
 public:
-    CarelessPool() : MtThreadPool("careless", 1, false, 0) {}
+    explicit CarelessPool(Gate& isBusy) : MtThreadPool("careless", 1, false, 0), _isBusy(isBusy) {}
 
 protected:
     void performTask(unsigned) override {
+        _isBusy.open();
         while (isRunning()) std::this_thread::yield();
     }
+
+private:
+    Gate& _isBusy;
 };
 
 TEST(MtThreadPoolDeathTest, destroyingAPoolThatRunsAbortsWithAMessage) {
     GTEST_FLAG_SET(death_test_style, "threadsafe");
-    EXPECT_DEATH(
-        {
-            CarelessPool pool;
-            pool.start();
-        },
-        "Thread pool \"careless\" is destroyed while it runs");
+    constexpr const char* MESSAGE = "Thread pool \"careless\" is destroyed while it runs";
+    const auto destroy = [](bool waitsUntilBusy) {
+        Gate isBusy;
+        CarelessPool pool(isBusy);
+        pool.start();
+        if (waitsUntilBusy) isBusy.wait();
+    };
+    EXPECT_DEATH(destroy(true), MESSAGE);
+    // The worker may call a function of the derived class when that is gone.
+    for (int i = 0; i < 3; ++i) EXPECT_DEATH(destroy(false), MESSAGE);
 }
 
 }  // namespace

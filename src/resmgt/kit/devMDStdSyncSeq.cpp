@@ -66,6 +66,13 @@ DevMDSyncSeqSignals::DevMDSyncSeqSignals(ObjPtr<DevANO> ready, ObjPtr<DevANO> lo
     _signals->lockLost = std::move(lockLost);
 }
 
+DevMDSyncSeqSignals::DevMDSyncSeqSignals() noexcept = default;
+DevMDSyncSeqSignals::DevMDSyncSeqSignals(const DevMDSyncSeqSignals&) noexcept = default;
+DevMDSyncSeqSignals::DevMDSyncSeqSignals(DevMDSyncSeqSignals&&) noexcept = default;
+DevMDSyncSeqSignals& DevMDSyncSeqSignals::operator=(const DevMDSyncSeqSignals&) = default;
+DevMDSyncSeqSignals& DevMDSyncSeqSignals::operator=(DevMDSyncSeqSignals&&) = default;
+DevMDSyncSeqSignals::~DevMDSyncSeqSignals() = default;
+
 void DevMDSyncSeqSignals::ready() const {
     if (!_signals.isNull()) _signals->ready->performExecute();
 }

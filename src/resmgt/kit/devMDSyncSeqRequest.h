@@ -47,8 +47,13 @@ private:
 /// - Threads: any, several at once.
 class ORV_RESMGT_API DevMDSyncSeqSignals {
 public:
-    DevMDSyncSeqSignals() noexcept = default;  ///< Of no sequence: says nothing.
+    DevMDSyncSeqSignals() noexcept;  ///< Of no sequence: says nothing.
     DevMDSyncSeqSignals(ObjPtr<DevANO> ready, ObjPtr<DevANO> lockLost);
+    DevMDSyncSeqSignals(const DevMDSyncSeqSignals&) noexcept;
+    DevMDSyncSeqSignals(DevMDSyncSeqSignals&&) noexcept;
+    DevMDSyncSeqSignals& operator=(const DevMDSyncSeqSignals&);
+    DevMDSyncSeqSignals& operator=(DevMDSyncSeqSignals&&);
+    ~DevMDSyncSeqSignals();
 
     void ready() const;     ///< After start; taken once.
     void lockLost() const;  ///< Fallen out of step; the device will be told to recover.

@@ -74,7 +74,7 @@ RCShdPtr<DevMgrObserverList::Entry> DevMgrObserverList::remove(
         return entry->owner == owner && entry->observer.get() == &observer;
     });
     if (found == _entries.end()) return nullptr;
-    const RCShdPtr<Entry> entry = *found;
+    RCShdPtr<Entry> entry = std::move(*found);
     _entries.erase(found);
     entry->isDetached = true;
     return entry;

@@ -227,6 +227,7 @@ void StreamAccImp::disconnect(const LiString& configString) {
 std::vector<DevMgrStreamAcc::Connection> StreamAccImp::getConnections() const {
     std::vector<Connection> result;
     const LkGuard guard(_mediator->getConfigLock());
+    result.reserve(_links.size());
     for (const Link& link : _links) {
         result.push_back({link.configString, link.getActive()->getState()});
     }

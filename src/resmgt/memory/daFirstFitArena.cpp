@@ -20,7 +20,6 @@ std::uint64_t addressOf(const void* pointer) noexcept {
 }
 
 void* pointerTo(std::uint64_t address) noexcept {
-    // NOLINTNEXTLINE(performance-no-int-to-ptr)
     return reinterpret_cast<void*>(static_cast<std::uintptr_t>(address));
 }
 

@@ -65,7 +65,8 @@ bool MtRequestMgr::timedWaitRequestCountZero(const MtRequestTag& tag, double sec
 }
 
 bool MtRequestMgr::wait(const MtRequestTag& tag, const LkTimeLimit& limit) {
-    const MtRequestTag held = tag;  // the record stays, whoever releases the tag meanwhile
+    // The record stays, whoever releases the tag meanwhile.
+    const MtRequestTag held = tag;  // NOLINT(performance-unnecessary-copy-initialization)
     const LkGuard guard(_mutex);
     return held.getRecord(*this).waitZero(guard, limit);
 }

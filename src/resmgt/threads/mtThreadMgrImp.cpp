@@ -19,7 +19,7 @@ MtThreadMgrImp::MtThreadMgrImp() : _nbProcessors(MtUtil::getNbProcessors()) {}
 MtThreadMgrImp::~MtThreadMgrImp() noexcept(false) {
     const LkGuard guard(_lock);
     ORV_ASSERT_IN_DESTRUCTOR_TEXT(_threads.getSize() == 0, "_threads.size() == 0");
-    ORV_ASSERT_IN_DESTRUCTOR_TEXT(_groups.size() == 0, "_groups.size() == 0");
+    ORV_ASSERT_IN_DESTRUCTOR_TEXT(_groups.empty(), "_groups.size() == 0");
 }
 
 // Threads

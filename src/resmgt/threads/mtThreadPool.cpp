@@ -62,8 +62,12 @@ MtThreadPool::MtThreadPool(const LiString& name, unsigned nbThreads, bool placeO
 
 MtThreadPool::~MtThreadPool() {
     const LkGuard guard(_control);
-    if (!_hasStarted) return;
-    // The derived class, whose functions the workers call, is gone.
+    if (_hasStarted) abortDestroyed();
+}
+
+/// The derived class, whose functions the workers call, is gone. Destructor and workers meet here in
+/// any order.
+void MtThreadPool::abortDestroyed() const {
     ORV_TRACE(TraceLevel::getMain()) << "Thread pool \"" << _name
                                      << "\" is destroyed while it runs: stop it in the destructor "
                                         "of the derived class.";
@@ -148,6 +152,9 @@ unsigned MtThreadPool::findWorker() const noexcept {
 }
 
 void MtThreadPool::obtainTask(unsigned) {}
+void MtThreadPool::performTask(unsigned) {
+    abortDestroyed();
+}
 void MtThreadPool::doneTask(unsigned) {}
 void MtThreadPool::stopThreads() {}
 void MtThreadPool::prepareThreads() {}

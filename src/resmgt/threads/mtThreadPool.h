@@ -57,7 +57,7 @@ protected:
 
     // Called by the worker, in this order; what they throw ends it, and stop() throws it again.
     virtual void obtainTask(unsigned worker);
-    virtual void performTask(unsigned worker) = 0;
+    virtual void performTask(unsigned worker);  ///< To be overridden: here it aborts.
     virtual void doneTask(unsigned worker);
 
     /// Wakes the workers, which are to end: once for each start, after isRunning() has become false.
@@ -80,6 +80,7 @@ private:
     Priority _priority;
     std::vector<ObjPtr<MtThread>> _threads;
 
+    [[noreturn]] void abortDestroyed() const;
     void runWorker(unsigned worker);
     void askToStop();
     void stopNoLock() ORV_REQUIRES(_control);

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <orv/devMDPropertyAny.h>
+#include <orv/rcShdPtr.h>
+#include <string>
+
+namespace MediaHost {
+
+/// Properties of any type as text; vectors of signed chars are texts.
+///
+/// - Errors: what the property throws; MediaError for a text that is no value of its type.
+namespace PropertyText {
+
+using Property = Orv::RCShdPtr<Orv::DevMDPropertyAny>;
+
+std::string getTypeName(const Property& property);          ///< Such as "double" or "float[]".
+std::string get(const Property& property, double seconds);  ///< Waits at most so long.
+void set(const Property& property, const std::string& value);
+
+}  // namespace PropertyText
+}  // namespace MediaHost

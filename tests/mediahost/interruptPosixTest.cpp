@@ -1,0 +1,109 @@
+// Ctrl-C, whenever it comes: the sequence stops in order, and what there is becomes whole.
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include "eventually.h"
+#include "hostProgram.h"
+
+namespace Orv {
+
+namespace {
+
+using testing::HasSubstr;
+
+/// orv-mediahost as a process of its own.
+class Host {
+public:
+    explicit Host(std::vector<std::string> arguments) : _log(_folder / "log") {
+        _process = fork();
+        if (_process != 0) return;
+        const int log = open(_log.c_str(), O_WRONLY | O_CREAT, 0600);
+        dup2(log, 1);
+        dup2(log, 2);
+        arguments.insert(arguments.begin(), "./orv-mediahost");
+        std::vector<char*> pointers;
+        for (std::string& argument : arguments) pointers.push_back(argument.data());
+        pointers.push_back(nullptr);
+        execv(pointers[0], pointers.data());
+        _exit(127);
+    }
+    ~Host() {
+        if (_process > 0) {
+            kill(_process, SIGKILL);
+            waitpid(_process, nullptr, 0);
+        }
+    }
+    Host(const Host&) = delete;
+    Host& operator=(const Host&) = delete;
+
+    void interrupt() const { kill(_process, SIGINT); }
+    std::string getOutput() const { return readFile(_log); }
+    bool hasWritten(const char* text) const { return getOutput().find(text) != std::string::npos; }
+
+    /// The exit code; -1 if a signal ended it.
+    int join() {
+        int status = 0;
+        waitpid(std::exchange(_process, 0), &status, 0);
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+
+private:
+    const TestFolder _folder;
+    const std::string _log;
+    pid_t _process;
+};
+
+TEST(MediaHostInterrupt, finishesTheFilesOfAShowThatIsOn) {
+    const TestFolder out;
+    Host host({"play", "simulated:320x180@25,3600", "--rate", "realtime", "--checksums", "--out",
+               out.getPath()});
+    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); }))
+        << host.getOutput();
+    host.interrupt();
+    EXPECT_EQ(host.join(), 130) << host.getOutput();
+    EXPECT_THAT(host.getOutput(), HasSubstr("interrupted after"));
+    EXPECT_EQ(out.list(), (std::vector<std::string>{"contact-sheet.png", "frames.txt", "report.xml",
+                                                    "sound.wav", "waveform.png"}));
+    EXPECT_THAT(readFile(out / "report.xml"), HasSubstr("whole=\"false\""));
+    const Wave wave = readWave(out / "sound.wav");
+    EXPECT_GT(wave.samples.size(), 0u);
+    EXPECT_LT(wave.samples.size(), 3600u * 48000 * 2);
+}
+
+TEST(MediaHostInterrupt, endsInOrderAtAnyMomentOfTheStart) {
+    // The moment moves along the start, in steps of what the program has done by then.
+    for (int i = 0; i < 12; ++i) {
+        const TestFolder out;
+        Host host(
+            {"play", "simulated:320x180@25,3600", "--rate", "realtime", "--out", out.getPath()});
+        // Before the handler is there the signal ends the program, as it does any other.
+        for (int wait = 0; wait < i; ++wait) usleep(2000);
+        host.interrupt();
+        const int code = host.join();
+        EXPECT_TRUE(code == 130 || code == -1) << code << host.getOutput();
+        for (const std::string& name : out.list()) {
+            EXPECT_EQ(name.find(".part"), std::string::npos) << name;
+            if (name == "sound.wav") readWave(out / name);
+        }
+    }
+}
+
+TEST(MediaHostInterrupt, endsAtOnceWhenAskedTwice) {
+    const TestFolder out;
+    Host host({"play", "simulated:64x48@25,3600", "--rate", "realtime", "--loops", "0", "--out",
+               out.getPath()});
+    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); }))
+        << host.getOutput();
+    host.interrupt();
+    host.interrupt();
+    EXPECT_EQ(host.join(), 130) << host.getOutput();
+    if (std::filesystem::exists(out / "sound.wav")) readWave(out / "sound.wav");
+}
+
+}  // namespace
+
+}  // namespace Orv
