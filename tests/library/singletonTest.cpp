@@ -17,8 +17,8 @@ TEST(Library, givesTheProgramAndAnotherLibraryTheSameSingleton) {
         threads.emplace_back([&nbReady, i] {
             // All ask for the first time at once.
             for (++nbReady; nbReady.load() != NB_THREADS;) std::this_thread::yield();
-            SharedTable& table = i % 2 == 0 ? getTableOfOtherLibrary()
-                                            : LkSingleton<SharedTable>::getInstance();
+            SharedTable& table =
+                i % 2 == 0 ? getTableOfOtherLibrary() : LkSingleton<SharedTable>::getInstance();
             ++table.nbEntries;
         });
     }

@@ -194,7 +194,7 @@ void Host::setProperty(const std::string& property, const std::string& value) {
 
 void Host::watch(const std::string& property) {
     doing("cannot watch the property \"" + property + '"', [&] {
-        const auto print = [this, property](const Orv::DevMgrPropertyObserverHint& hint) {
+        const auto print = [property](const Orv::DevMgrPropertyObserverHint& hint) {
             std::string line = std::to_string(Process::getSecondsSinceStart()) + " s  " + property +
                                " = " + PropertyText::get(hint.getProperty(), GET_SECONDS) + '\n';
             std::cout << line << std::flush;
