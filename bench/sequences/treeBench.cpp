@@ -25,7 +25,7 @@ public:
 };
 
 Orv::LiString nameOf(int number) {
-    return Orv::LiString(("member" + std::to_string(number)).c_str());
+    return Orv::LiString(std::string("member").append(std::to_string(number)));
 }
 
 /// A manager with devices that are open already; kept until the program ends.
@@ -62,14 +62,14 @@ std::string describeGroup(int first, int nbNodes) {
     if (firstChild >= nbNodes) return text;
     text += " (";
     for (int i = firstChild; i < firstChild + NB_CHILDREN && i < nbNodes; ++i) {
-        text += describeGroup(i, nbNodes) + " ";
+        text.append(describeGroup(i, nbNodes)).append(" ");
     }
-    return text + ")";
+    return text.append(")");
 }
 
 void runTree(benchmark::State& state, int nbNodes) {
     Stage& stage = Stage::get(nbNodes);
-    const Orv::LiString tree(("(" + describeGroup(0, nbNodes) + ")").c_str());
+    const Orv::LiString tree(std::string("(").append(describeGroup(0, nbNodes)).append(")"));
     for (auto _ : state) {
         state.PauseTiming();
         Orv::ObjPtr<Orv::DevMgrSyncSeqAcc> acc = stage.getManager().createSyncSeqAcc();
@@ -149,7 +149,8 @@ void runRequests(benchmark::State& state, int nbNodes) {
 
 const bool isRegistered = [] {
     for (const int size : {10, 100, 1000}) {
-        const std::string name = "start+stop " + std::to_string(size) + " nodes/";
+        const std::string name =
+            std::string("start+stop ").append(std::to_string(size)).append(" nodes/");
         benchmark::RegisterBenchmark((name + "DevMgrSyncSeqAcc").c_str(), runTree, size)
             ->UseRealTime();
         benchmark::RegisterBenchmark((name + "bare requests").c_str(), runRequests, size)
