@@ -43,7 +43,8 @@ Run run(std::vector<std::string> arguments) {
         wait4(process, &status, 0, &usage);
     }
     posix_spawn_file_actions_destroy(&actions);
-    if (!WIFEXITED(status) || WEXITSTATUS(status) == 1 || WEXITSTATUS(status) > 2) std::abort();
+    // Other codes tell of damaged pieces, of which one of the clips has many.
+    if (!WIFEXITED(status) || WEXITSTATUS(status) == 1 || WEXITSTATUS(status) == 127) std::abort();
     const auto toSeconds = [](const timeval& time) {
         return static_cast<double>(time.tv_sec) + static_cast<double>(time.tv_usec) * 1e-6;
     };

@@ -47,7 +47,9 @@ HostRun runCommand(const std::string& command) {
                                        ? command + " >" + path
                                        : command.substr(0, errors) + " >" + path + " 2>&1";
     const int code = toCode(std::system(redirected.c_str()));
-    return {code, readFile(path)};
+    std::string output = readFile(path);
+    std::erase(output, '\r');  // lines end alike on every platform
+    return {code, output};
 }
 
 TestFolder::TestFolder() {

@@ -55,21 +55,27 @@ TEST(MediaHost, burnsInAndReportsTheTimecodesOfEveryStandard) {
         const char* rate;
         int perSecond;
         bool isDropping;
+        int nbSeconds;
     };
-    for (const Row& row :
-         {Row{"film24", "24", 24, false}, Row{"pal", "25", 25, false},
-          Row{"ntsc-nd", "30000/1001", 30, false}, Row{"ntsc-df", "30000/1001", 30, true}}) {
+    for (const Row& row : {Row{"film24", "24", 24, false, 130}, Row{"pal", "25", 25, false, 130},
+                           Row{"ntsc-nd", "30000/1001", 30, false, 130},
+                           // Beyond the tenth minute, which drops nothing.
+                           Row{"ntsc-df", "30000/1001", 30, true, 610}}) {
         SCOPED_TRACE(row.name);
         const TestFolder folder;
-        // Beyond the tenth minute, where dropping differs.
-        const HostRun run =
-            runHost(std::string("play simulated:96x64@") + row.rate + ",610 --timecode " +
-                    row.name + " --checksums --out " + folder.getPath());
+        const std::string path = folder / "bars.pipeline";
+        writeFile(path, "timecode " + std::string(row.name) +
+                            "\ndevice bars pattern width=96 height=64 rate=" + row.rate +
+                            " seconds=" + std::to_string(row.nbSeconds) +
+                            "\ndevice screen display\ndevice tape recorder checksums=1\n"
+                            "device beat clock\nout \"" +
+                            (folder / "out") + "\"\n");
+        const HostRun run = runHost("run " + path);
         ASSERT_EQ(run.code, 0) << run.output;
-        const std::vector<FrameLine> lines = readFrames(folder / "frames.txt");
+        const std::vector<FrameLine> lines = readFrames(folder / "out/frames.txt");
         ASSERT_EQ(lines.size(),
                   static_cast<std::size_t>(std::llround(
-                      610.0 * (row.perSecond == 30 ? 30000.0 / 1001 : row.perSecond))));
+                      row.nbSeconds * (row.perSecond == 30 ? 30000.0 / 1001 : row.perSecond))));
         Wheels wheels(row.perSecond, row.isDropping);
         std::set<std::string> pictures;
         for (const FrameLine& line : lines) {
