@@ -220,7 +220,8 @@ TEST(MediaHost, showsAndSetsPropertiesOfItsDevices) {
     const HostRun watch = runHost("watch simulated:32x32@25,1 pattern:position mixer:master:peak");
     EXPECT_EQ(watch.code, 0);
     EXPECT_THAT(watch.output, HasSubstr("pattern:position = "));
-    EXPECT_THAT(watch.output, HasSubstr("mixer:master:peak = -0.9"));  // the click
+    // The click at the begin may be over when the notice of it is read; the tone stays.
+    EXPECT_THAT(watch.output, HasSubstr("mixer:master:peak = -12.04"));
     const HostRun graph = runHost("graph simulated");
     EXPECT_THAT(graph.output, HasSubstr("\"mixer\" -> \"scope\" [label=\"out\"]"));
     EXPECT_THAT(graph.output, HasSubstr("\"display\" -> \"tone\" [style=dashed"));

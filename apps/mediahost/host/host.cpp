@@ -194,11 +194,16 @@ void Host::setProperty(const std::string& property, const std::string& value) {
 
 void Host::watch(const std::string& property) {
     doing("cannot watch the property \"" + property + '"', [&] {
-        const auto print = [property](const Orv::DevMgrPropertyObserverHint& hint) {
-            std::string line = std::to_string(Process::getSecondsSinceStart()) + " s  " + property +
-                               " = " + PropertyText::get(hint.getProperty(), GET_SECONDS) + '\n';
-            std::cout << line << std::flush;
-        };
+        // What is read is the value of now, so several notices in a row may find the same one.
+        const auto print =
+            [property, last = std::string()](const Orv::DevMgrPropertyObserverHint& hint) mutable {
+                std::string value = PropertyText::get(hint.getProperty(), GET_SECONDS);
+                if (value == last) return;
+                const std::string line = std::to_string(Process::getSecondsSinceStart()) + " s  " +
+                                         property + " = " + value + '\n';
+                last = std::move(value);
+                std::cout << line << std::flush;
+            };
         Orv::DevMgrPropertyObserverUtil::attachObserver(
             *_watches, property.c_str(), Orv::DevMgrPropertyFunctionObserver::create(print));
     });
