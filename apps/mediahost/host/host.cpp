@@ -10,6 +10,7 @@
 #include <orv/liTimeCodeNtscDf.h>
 #include <orv/liTimeCodeNtscNd.h>
 #include <orv/liTimeCodePal.h>
+#include <orv/lkGuard.h>
 
 #include "clockDevice.h"
 #include "displayDevice.h"
@@ -81,6 +82,30 @@ const std::vector<DeviceKind>& listKinds() {
     return KINDS_ONLY;
 }
 
+/// A property that is printed when it has changed.
+class Host::Watch {
+public:
+    Watch(const std::string& name, const Orv::RCShdPtr<Orv::DevMDPropertyAny>& property)
+        : _name(name), _property(property) {}
+
+    // What is read is the value of now, so several notices in a row may find the same one.
+    void print() {
+        const Orv::LkGuard guard(_mutex);
+        std::string value = PropertyText::get(_property, GET_SECONDS);
+        if (value == _last) return;
+        std::cout << std::to_string(Process::getSecondsSinceStart()) + " s  " + _name + " = " +
+                         value + '\n'
+                  << std::flush;
+        _last = std::move(value);
+    }
+
+private:
+    const std::string _name;
+    const Orv::RCShdPtr<Orv::DevMDPropertyAny> _property;
+    Orv::LkMutex _mutex{"Watch"};
+    std::string _last;
+};
+
 Host::Host(Pipeline pipeline) : _pipeline(std::move(pipeline)) {
     applyOptions();
 }
@@ -88,6 +113,7 @@ Host::Host(Pipeline pipeline) : _pipeline(std::move(pipeline)) {
 Host::~Host() {
     // In the order in which one uses the other; the manager closes the devices.
     _watches.reset();
+    _watched.clear();
     _sequence.reset();
     _context.pacer.stop();
     _streams.reset();
@@ -194,18 +220,13 @@ void Host::setProperty(const std::string& property, const std::string& value) {
 
 void Host::watch(const std::string& property) {
     doing("cannot watch the property \"" + property + '"', [&] {
-        // What is read is the value of now, so several notices in a row may find the same one.
-        const auto print =
-            [property, last = std::string()](const Orv::DevMgrPropertyObserverHint& hint) mutable {
-                std::string value = PropertyText::get(hint.getProperty(), GET_SECONDS);
-                if (value == last) return;
-                const std::string line = std::to_string(Process::getSecondsSinceStart()) + " s  " +
-                                         property + " = " + value + '\n';
-                last = std::move(value);
-                std::cout << line << std::flush;
-            };
+        const auto watched =
+            std::make_shared<Watch>(property, _watches->getProperty(property.c_str()));
         Orv::DevMgrPropertyObserverUtil::attachObserver(
-            *_watches, property.c_str(), Orv::DevMgrPropertyFunctionObserver::create(print));
+            *_watches, property.c_str(),
+            Orv::DevMgrPropertyFunctionObserver::create(
+                [watched](const Orv::DevMgrPropertyObserverHint&) { watched->print(); }));
+        _watched.push_back(watched);
     });
 }
 
@@ -288,12 +309,15 @@ bool Host::play() {
     _sequence->start();
     _sequence->sync(Orv::DtTime(0.0));
     bool isWhole = waitInStep();
-    const double began = Process::getSecondsSinceStart();
     if (isWhole) isWhole = waitForEnd();
-    _playedSeconds = Process::getSecondsSinceStart() - began;
+    _playedSeconds = _context.pacer.getSecondsSinceStart();
+    if (!isWhole) {
+        std::cout << "interrupted: stopping in order; once more ends at once" << std::endl;
+    }
     stop();
     _streams.reset();
     _watches.reset();
+    for (const auto& watched : _watched) watched->print();  // the notice of it may still be due
     _context.rethrowFailure();
     return isWhole;
 }

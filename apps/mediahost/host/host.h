@@ -44,7 +44,7 @@ public:
     const HostContext& getContext() const { return _context; }
     const std::vector<std::string>& getConnections() const { return _connections; }
     const std::string& getTree() const { return _tree; }
-    double getPlayedSeconds() const { return _playedSeconds; }  ///< From in step to the last end.
+    double getPlayedSeconds() const { return _playedSeconds; }  ///< From the start to the last end.
 
     Orv::RCShdPtr<Orv::DevMDPrtcl> getDevice(const std::string& name);
     Orv::DevMgrPropertyAcc& getProperties() { return *_properties; }
@@ -55,6 +55,8 @@ public:
     void watch(const std::string& property);  ///< Prints it whenever it changes.
 
 private:
+    class Watch;
+
     Pipeline _pipeline;
     HostContext _context;
     std::vector<std::string> _registered;
@@ -63,6 +65,7 @@ private:
     Orv::ObjPtr<Orv::DevMgrPropertyAcc> _watches;  // goes first: observers use the other
     Orv::ObjPtr<Orv::DevMgrStreamAcc> _streams;
     Orv::ObjPtr<Orv::DevMgrSyncSeqAcc> _sequence;
+    std::vector<std::shared_ptr<Watch>> _watched;
     std::vector<std::string> _connections;
     std::string _tree;
     double _playedSeconds = 0;
