@@ -20,11 +20,12 @@ enum ExitCode { PLAYED = 0, FAILED = 1, PLAYED_WITH_FAULTS = 2, INTERRUPTED = 13
 struct Options {
     std::string input;
     std::vector<std::string> names;  // of devices or properties, or assignments
-    std::string folder, rate = "fast", loops = "1", cache = "64M", strategy = "lru",
-                        timecode = "pal", trace;
+    std::string folder, film, rate, loops = "1", cache = "64M", strategy = "lru", timecode = "pal",
+                                    trace;
     std::vector<std::string> sets, watches;
     std::int64_t nbThreads = 0;
-    bool isReverse = false, hasFrames = false, hasChecksums = false, hasWindow = false;
+    bool isReverse = false, hasFrames = false, hasChecksums = false, hasWindow = false,
+         hasSound = false;
 };
 
 /// "simulated", or "simulated:1920x1080@60,8": width, height, rate, seconds.
@@ -76,7 +77,9 @@ void takeOptions(Pipeline& pipeline, const Options& options) {
     asked(
         "--timecode", [&](const std::string& text) { pipeline.setTimecode(text); },
         options.timecode);
-    asked("--rate", [&](const std::string& text) { pipeline.setRate(text); }, options.rate);
+    asked(
+        "--rate", [&](const std::string& text) { pipeline.setRate(text); },
+        options.rate.empty() ? std::string(options.hasSound ? "realtime" : "fast") : options.rate);
     asked("--loops", [&](const std::string& text) { pipeline.setLoops(text); }, options.loops);
     pipeline.isReverse = options.isReverse;
     pipeline.folder = options.folder;
@@ -93,12 +96,14 @@ Pipeline makePipeline(const Options& options) {
     addSources(pipeline, options);
     pipeline.addDevice("mixer", "mixer");
     pipeline.addDevice("scope", "scope");
+    if (options.hasSound) pipeline.addDevice("speaker", "speaker");
     Settings display;
     display.set("window", options.hasWindow ? "1" : "0");
     pipeline.addDevice("display", "display", display);
     Settings recorder;
     recorder.set("frames", options.hasFrames ? "1" : "0");
     recorder.set("checksums", options.hasChecksums ? "1" : "0");
+    if (!options.film.empty()) recorder.set("encode", options.film);
     pipeline.addDevice("recorder", "recorder", recorder);
     pipeline.addDevice("clock", "clock");
     return pipeline;
@@ -208,7 +213,7 @@ int graph(const Options& options) {
 }
 
 void addShowOptions(CLI::App& command, Options& options) {
-    command.add_option("--rate", options.rate, "realtime, fast, or a multiple of real time");
+    command.add_option("--rate", options.rate, "realtime, fast (else), or a multiple of real time");
     command.add_flag("--reverse", options.isReverse, "play backwards");
     command.add_option("--loops", options.loops, "how often to play; 0: for ever");
     command.add_option("--cache", options.cache, "memory for pictures: 64M, 1G, 10frames");
@@ -221,6 +226,7 @@ void addShowOptions(CLI::App& command, Options& options) {
     command.add_option("--trace", options.trace,
                        "writes a timeline for chrome://tracing or Perfetto");
     command.add_flag("--window", options.hasWindow, "shows the pictures in a window");
+    command.add_flag("--sound", options.hasSound, "lets the sound be heard, in real time");
 }
 
 constexpr const char* INPUT_HELP = "a media file, or simulated[:WIDTHxHEIGHT@RATE,SECONDS]";
@@ -235,6 +241,7 @@ int runCommand(int nbArguments, char** arguments) {
     command->add_option("input", options.input, INPUT_HELP)->required();
     command->add_option("--out", options.folder, "a folder for sound, contact sheet and report");
     command->add_flag("--frames", options.hasFrames, "writes each picture as PNG, too");
+    command->add_option("--encode", options.film, "writes the pictures as a film of that name");
     command->add_flag("--checksums", options.hasChecksums, "writes the checksum of each picture");
     command->add_option("--watch", options.watches, "DEVICE:PROPERTY, printed when it changes")
         ->take_all();

@@ -20,8 +20,19 @@ using testing::HasSubstr;
 class Host {
 public:
     explicit Host(std::vector<std::string> arguments) : _log(_folder / "log") {
+        // Who starts the tests may ignore Ctrl-C, as shells do for what runs behind; one that comes
+        // before the child takes it again waits.
+        sigset_t interrupts, before;
+        sigemptyset(&interrupts);
+        sigaddset(&interrupts, SIGINT);
+        sigprocmask(SIG_BLOCK, &interrupts, &before);
         _process = fork();
-        if (_process != 0) return;
+        if (_process != 0) {
+            sigprocmask(SIG_SETMASK, &before, nullptr);
+            return;
+        }
+        signal(SIGINT, SIG_DFL);
+        sigprocmask(SIG_UNBLOCK, &interrupts, nullptr);
         const int log = open(_log.c_str(), O_WRONLY | O_CREAT, 0600);
         dup2(log, 1);
         dup2(log, 2);

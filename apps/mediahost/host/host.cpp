@@ -22,6 +22,7 @@
 #include "recorderDevice.h"
 #include "scopeDevice.h"
 #include "simulatedDevices.h"
+#include "speakerDevice.h"
 
 namespace MediaHost {
 
@@ -50,7 +51,9 @@ const std::pair<DeviceKind, Create> KINDS[] = {
      createEntry<MixerDevice>},
     {{"scope", "levels of the sound, and a picture of its waveform"}, createEntry<ScopeDevice>},
     {{"display", "a window, and a contact sheet of the pictures"}, createEntry<DisplayDevice>},
-    {{"recorder", "writes sound as WAV, and pictures as PNG"}, createEntry<RecorderDevice>},
+    {{"speaker", "lets the sound be heard"}, createEntry<SpeakerDevice>},
+    {{"recorder", "writes sound as WAV, and pictures as PNG or as a film"},
+     createEntry<RecorderDevice>},
     {{"clock", "beats the time for all others, by the sync engine"}, createEntry<ClockDevice>},
 };
 
@@ -255,6 +258,7 @@ void Host::connectStandard() {
     };
     const auto* mixer = find("mixer");
     const auto* scope = find("scope");
+    const auto* speaker = find("speaker");
     const auto* display = find("display");
     const auto* recorder = find("recorder");
     int nbChannels = 0;
@@ -277,8 +281,13 @@ void Host::connectStandard() {
     }
     if (nbChannels > 0 && scope != nullptr) {
         _pipeline.connect(mixer->name + ":out push " + scope->name + ":audio");
+        const auto* last = scope;
+        if (speaker != nullptr) {
+            _pipeline.connect(last->name + ":through push " + speaker->name + ":audio");
+            last = speaker;
+        }
         if (recorder != nullptr) {
-            _pipeline.connect(scope->name + ":through push " + recorder->name + ":audio");
+            _pipeline.connect(last->name + ":through push " + recorder->name + ":audio");
         }
     }
 }
@@ -286,7 +295,8 @@ void Host::connectStandard() {
 // One below the other, those that take below nobody but the clock, sources last: so what a device
 // needs is started before it and stopped after it.
 std::string Host::makeTree() const {
-    static const char* const ORDER[] = {"clock", "recorder", "scope", "mixer", "display"};
+    static const char* const ORDER[] = {"clock", "recorder", "speaker",
+                                        "scope", "mixer",    "display"};
     std::vector<std::string> leaders;
     std::string sources;
     for (const char* kind : ORDER) {
