@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <signal.h>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -126,17 +127,55 @@ TEST(MediaHostInterrupt, waitsForTheFilesOfAShowThatIsOver) {
     EXPECT_THAT(readFile(out / "report.xml"), HasSubstr("whole=\"false\""));
 }
 
-TEST(MediaHostInterrupt, endsAtOnceWhenAskedTwice) {
-    const TestFolder out;
-    ASSERT_EQ(mkfifo((out / "sound.wav.part").c_str(), 0600), 0);
-    Host host({"play", "simulated:64x48@25,3600", "--rate", "realtime", "--loops", "0", "--out",
-               out.getPath()});
-    ASSERT_TRUE(eventually("the show is on", [&] { return host.hasWritten("queues"); }))
+/// A pipe in the place of a file: it takes a page, then the writer waits for ever.
+class StuckPipe {
+public:
+    explicit StuckPipe(const std::string& path) {
+        EXPECT_EQ(mkfifo(path.c_str(), 0600), 0);
+        _descriptor = open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
+        _nbBytes = fcntl(_descriptor, F_SETPIPE_SZ, 1);  // one page
+        EXPECT_GT(_nbBytes, 0);
+    }
+    ~StuckPipe() { close(_descriptor); }
+    StuckPipe(const StuckPipe&) = delete;
+    StuckPipe& operator=(const StuckPipe&) = delete;
+
+    bool isFull() const {
+        int nbBytes = 0;
+        return ioctl(_descriptor, FIONREAD, &nbBytes) == 0 && nbBytes >= _nbBytes;
+    }
+
+private:
+    int _descriptor;
+    int _nbBytes;
+};
+
+/// Plays until the recorder is stuck, in the middle of a block of sound, and has heard of Ctrl-C.
+void interruptWithRecorderStuck(Host& host, const StuckPipe& pipe) {
+    ASSERT_TRUE(eventually("the recorder is stuck", [&] { return pipe.isFull(); }))
         << host.getOutput();
     host.interrupt();
-    // The recorder would keep it from stopping, which would end with an error.
     ASSERT_TRUE(eventually("it stops", [&] { return host.hasWritten("interrupted: "); }))
         << host.getOutput();
+}
+
+TEST(MediaHostInterrupt, givesUpADeviceThatDoesNotStop) {
+    const TestFolder out;
+    const StuckPipe pipe(out / "sound.wav.part");
+    Host host({"play", "simulated:64x48@25,3600", "--rate", "realtime", "--patience", "0.3",
+               "--out", out.getPath()});
+    interruptWithRecorderStuck(host, pipe);
+    EXPECT_EQ(host.join(), 1) << host.getOutput();
+    EXPECT_THAT(host.getOutput(), HasSubstr("the devices do not stop and were given up"));
+    EXPECT_THAT(host.getOutput(), HasSubstr("recorder is in \""));
+}
+
+TEST(MediaHostInterrupt, endsAtOnceWhenAskedTwice) {
+    const TestFolder out;
+    const StuckPipe pipe(out / "sound.wav.part");
+    Host host({"play", "simulated:64x48@25,3600", "--rate", "realtime", "--patience", "1e6",
+               "--out", out.getPath()});
+    interruptWithRecorderStuck(host, pipe);
     host.interrupt();
     EXPECT_EQ(host.join(), 130) << host.getOutput();
 }

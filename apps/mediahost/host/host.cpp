@@ -1,6 +1,7 @@
 #include "host.h"
 
 #include <algorithm>
+#include <cstring>
 #include <iostream>
 #include <orv/devMgrEx.h>
 #include <orv/devMgrPropertyObserverUtil.h>
@@ -28,7 +29,6 @@ namespace MediaHost {
 
 namespace {
 
-constexpr double STOP_SECONDS = 10;  // what a sequence may take to stop before it is aborted
 constexpr double GET_SECONDS = 2;
 
 using Entry = Orv::ObjPtr<Orv::DevRegistryEntry>;
@@ -315,6 +315,17 @@ std::string Host::makeTree() const {
     return tree + std::string(leaders.size(), ')');
 }
 
+bool Host::isInSequence(const std::string& device) const {
+    const auto isEdge = [this](std::size_t at) {
+        return at >= _tree.size() || std::strchr("() ", _tree[at]) != nullptr;
+    };
+    for (std::size_t at = _tree.find(device); at != std::string::npos;
+         at = _tree.find(device, at + 1)) {
+        if ((at == 0 || isEdge(at - 1)) && isEdge(at + device.size())) return true;
+    }
+    return false;
+}
+
 bool Host::play() {
     _sequence->start();
     _sequence->sync(Orv::DtTime(0.0));
@@ -340,7 +351,7 @@ bool Host::waitFor(const char* state, double seconds) {
         _context.rethrowFailure();  // a device's own words are better
         std::string failures = "the sequence \"" + _tree + "\" has failed";
         for (const Pipeline::Device& device : _pipeline.devices) {
-            if (_tree.find(device.name) == std::string::npos) continue;
+            if (!isInSequence(device.name)) continue;
             const Orv::LiString failure = _sequence->getFailure(device.name.c_str());
             if (!failure.isEmpty()) failures += "; " + device.name + ": " + failure.getChars();
         }
@@ -372,11 +383,16 @@ bool Host::waitForEnd() {
 
 void Host::stop() {
     _sequence->stop();
-    if (waitFor("final", STOP_SECONDS)) return;
+    if (waitFor("final", _pipeline.patienceSeconds)) return;
     _sequence->abort();
-    if (!waitFor("final", STOP_SECONDS)) {
-        throw MediaError("the devices do not stop; " + _tree + " was given up");
+    if (waitFor("final", _pipeline.patienceSeconds)) return;
+    std::string states;
+    for (const Pipeline::Device& device : _pipeline.devices) {
+        if (!isInSequence(device.name)) continue;
+        const std::string state = _sequence->getState(device.name.c_str()).getChars();
+        if (state != "final") states += ", " + device.name + " is in \"" + state + '"';
     }
+    throw DevicesHang("the devices do not stop and were given up" + states);
 }
 
 }  // namespace MediaHost
