@@ -22,7 +22,8 @@ const char* DevPrtclEx::what() const noexcept {
 DevPrtclEx::ExNameNotUnique::ExNameNotUnique(const char* file, int line, const LiString& subject)
     : ExConcrete(file, line, "Not a unique name.", subject) {}
 
-DevPrtclEx::ExNameNotRegistered::ExNameNotRegistered(const char* file, int line, const LiString& subject)
+DevPrtclEx::ExNameNotRegistered::ExNameNotRegistered(const char* file, int line,
+                                                     const LiString& subject)
     : ExConcrete(file, line, "Device name not found in the registry.", subject) {}
 
 DevPrtclEx::ExMDStdAddStream::ExMDStdAddStream(const char* file, int line)
