@@ -33,6 +33,17 @@ public:
     void close() override { onClose(); }
 };
 
+/// An open device, with a property whose getter the test supplies.
+struct OpenDevice {
+    RCShdPtr<TestDevice> device{new TestDevice};
+    RCShdPtr<DevMDStdProperty<int>> value;
+
+    explicit OpenDevice(std::function<int()> getter, std::function<void(const int&)> setter = {}) {
+        value = device->addProperty<int>("value", "", std::move(getter), std::move(setter));
+        device->performOpen();
+    }
+};
+
 /// What makes a device's thread die.
 class Death : public std::runtime_error {
 public:
