@@ -1,6 +1,7 @@
 // orv-mediahost: plays, records and inspects media on the library's devices.
 
 #include <CLI/CLI.hpp>
+#include <functional>
 #include <iostream>
 #include <memory>
 #include <orv/lgChromeSink.h>
@@ -20,11 +21,12 @@ enum ExitCode { PLAYED = 0, FAILED = 1, PLAYED_WITH_FAULTS = 2, INTERRUPTED = 13
 struct Options {
     std::string input;
     std::vector<std::string> names;  // of devices or properties, or assignments
-    std::string folder, rate = "fast", loops = "1", cache = "64M", strategy = "lru",
-                        timecode = "pal", trace;
+    std::string folder, film, rate, loops = "1", cache = "64M", patience = "10", strategy = "lru",
+                                    timecode = "pal", trace;
     std::vector<std::string> sets, watches;
     std::int64_t nbThreads = 0;
-    bool isReverse = false, hasFrames = false, hasChecksums = false, hasWindow = false;
+    bool isReverse = false, hasFrames = false, hasChecksums = false, hasWindow = false,
+         hasSound = false;
 };
 
 /// "simulated", or "simulated:1920x1080@60,8": width, height, rate, seconds.
@@ -76,8 +78,13 @@ void takeOptions(Pipeline& pipeline, const Options& options) {
     asked(
         "--timecode", [&](const std::string& text) { pipeline.setTimecode(text); },
         options.timecode);
-    asked("--rate", [&](const std::string& text) { pipeline.setRate(text); }, options.rate);
+    asked(
+        "--rate", [&](const std::string& text) { pipeline.setRate(text); },
+        options.rate.empty() ? std::string(options.hasSound ? "realtime" : "fast") : options.rate);
     asked("--loops", [&](const std::string& text) { pipeline.setLoops(text); }, options.loops);
+    asked(
+        "--patience", [&](const std::string& text) { pipeline.setPatience(text); },
+        options.patience);
     pipeline.isReverse = options.isReverse;
     pipeline.folder = options.folder;
     pipeline.trace = options.trace;
@@ -93,12 +100,14 @@ Pipeline makePipeline(const Options& options) {
     addSources(pipeline, options);
     pipeline.addDevice("mixer", "mixer");
     pipeline.addDevice("scope", "scope");
+    if (options.hasSound) pipeline.addDevice("speaker", "speaker");
     Settings display;
     display.set("window", options.hasWindow ? "1" : "0");
     pipeline.addDevice("display", "display", display);
     Settings recorder;
     recorder.set("frames", options.hasFrames ? "1" : "0");
     recorder.set("checksums", options.hasChecksums ? "1" : "0");
+    if (!options.film.empty()) recorder.set("encode", options.film);
     pipeline.addDevice("recorder", "recorder", recorder);
     pipeline.addDevice("clock", "clock");
     return pipeline;
@@ -128,13 +137,19 @@ private:
 
 int play(Pipeline pipeline) {
     const Trace trace(pipeline.trace);
-    Host host(std::move(pipeline));
-    host.open();
-    host.connect();
-    const bool isWhole = host.play();
-    const Report report(host, isWhole);
+    auto host = std::make_unique<Host>(std::move(pipeline));
+    host->open();
+    host->connect();
+    bool isWhole = false;
+    try {
+        isWhole = host->play();
+    } catch (const DevicesHang&) {
+        (void)host.release();  // what hangs uses it until the program has ended
+        throw;
+    }
+    const Report report(*host, isWhole);
     report.print(std::cout);
-    const std::filesystem::path& folder = host.getPipeline().folder;
+    const std::filesystem::path& folder = host->getPipeline().folder;
     if (!folder.empty()) report.write(folder / "report.xml");
     if (!isWhole) return INTERRUPTED;
     return report.getFaults().empty() ? PLAYED : PLAYED_WITH_FAULTS;
@@ -208,7 +223,7 @@ int graph(const Options& options) {
 }
 
 void addShowOptions(CLI::App& command, Options& options) {
-    command.add_option("--rate", options.rate, "realtime, fast, or a multiple of real time");
+    command.add_option("--rate", options.rate, "realtime, fast (else), or a multiple of real time");
     command.add_flag("--reverse", options.isReverse, "play backwards");
     command.add_option("--loops", options.loops, "how often to play; 0: for ever");
     command.add_option("--cache", options.cache, "memory for pictures: 64M, 1G, 10frames");
@@ -218,62 +233,75 @@ void addShowOptions(CLI::App& command, Options& options) {
     command.add_option("--set", options.sets, "DEVICE:PROPERTY=VALUE before the start")->take_all();
     command.add_option("--threads", options.nbThreads,
                        "that decode pictures; 0: one per processor");
+    command.add_option("--patience", options.patience,
+                       "seconds that devices may take to stop before they are given up");
     command.add_option("--trace", options.trace,
                        "writes a timeline for chrome://tracing or Perfetto");
     command.add_flag("--window", options.hasWindow, "shows the pictures in a window");
+    command.add_flag("--sound", options.hasSound, "lets the sound be heard, in real time");
 }
 
 constexpr const char* INPUT_HELP = "a media file, or simulated[:WIDTHxHEIGHT@RATE,SECONDS]";
+
+/// A command that is carried out with the options when the command line is read.
+CLI::App& addCommand(CLI::App& app, const char* name, const char* description,
+                     std::function<void()> carryOut) {
+    CLI::App* command = app.add_subcommand(name, description);
+    command->callback(std::move(carryOut));
+    return *command;
+}
+
+void addShowCommands(CLI::App& app, Options& options, int& code) {
+    CLI::App& playing = addCommand(app, "play", "plays a file, or what is simulated",
+                                   [&] { code = play(makePipeline(options)); });
+    playing.add_option("input", options.input, INPUT_HELP)->required();
+    playing.add_option("--out", options.folder, "a folder for sound, contact sheet and report");
+    playing.add_flag("--frames", options.hasFrames, "writes each picture as PNG, too");
+    playing.add_option("--encode", options.film, "writes the pictures as a film of that name");
+    playing.add_flag("--checksums", options.hasChecksums, "writes the checksum of each picture");
+    playing.add_option("--watch", options.watches, "DEVICE:PROPERTY, printed when it changes")
+        ->take_all();
+    addShowOptions(playing, options);
+
+    CLI::App& watching = addCommand(app, "watch", "plays, and prints properties when they change",
+                                    [&] { code = watch(options); });
+    watching.add_option("input", options.input, INPUT_HELP)->required();
+    watching.add_option("property", options.names, "DEVICE:PROPERTY")->required();
+    addShowOptions(watching, options);
+
+    addCommand(app, "run", "plays what a text file describes",
+               [&] { code = play(Pipeline::read(options.input)); })
+        .add_option("file", options.input, "see docs/mediahost.md")
+        ->required();
+}
+
+void addDeviceCommands(CLI::App& app, Options& options, int& code) {
+    addCommand(app, "list", "lists the kinds of devices", [&] { code = list(); });
+    const auto add = [&](const char* name, const char* description, int (*carryOut)(const Options&),
+                         const char* argument, const char* help) {
+        CLI::App& command = addCommand(app, name, description,
+                                       [&options, &code, carryOut] { code = carryOut(options); });
+        command.add_option(argument, options.names, help)->required();
+        command.add_option("--input", options.input, "a file for the reader");
+    };
+    add("describe", "tells what properties and streams devices have", describe, "device",
+        "as list names them");
+    add("get", "prints properties", get, "property", "DEVICE:PROPERTY");
+    add("set", "sets properties and prints what they are then", set, "assignment",
+        "DEVICE:PROPERTY=VALUE");
+    addCommand(app, "graph", "prints devices, streams and sequence for Graphviz",
+               [&] { code = graph(options); })
+        .add_option("input", options.input, "as for play, or a pipeline file (.pipeline)")
+        ->required();
+}
 
 int runCommand(int nbArguments, char** arguments) {
     CLI::App app("Plays, records and inspects media.", "orv-mediahost");
     app.require_subcommand(1);
     Options options;
     int code = PLAYED;
-
-    CLI::App* command = app.add_subcommand("play", "plays a file, or what is simulated");
-    command->add_option("input", options.input, INPUT_HELP)->required();
-    command->add_option("--out", options.folder, "a folder for sound, contact sheet and report");
-    command->add_flag("--frames", options.hasFrames, "writes each picture as PNG, too");
-    command->add_flag("--checksums", options.hasChecksums, "writes the checksum of each picture");
-    command->add_option("--watch", options.watches, "DEVICE:PROPERTY, printed when it changes")
-        ->take_all();
-    addShowOptions(*command, options);
-    command->callback([&] { code = play(makePipeline(options)); });
-
-    command = app.add_subcommand("list", "lists the kinds of devices");
-    command->callback([&] { code = list(); });
-
-    command = app.add_subcommand("describe", "tells what properties and streams devices have");
-    command->add_option("device", options.names)->required();
-    command->add_option("--input", options.input, "a file for the reader");
-    command->callback([&] { code = describe(options); });
-
-    command = app.add_subcommand("get", "prints properties");
-    command->add_option("property", options.names, "DEVICE:PROPERTY")->required();
-    command->add_option("--input", options.input, "a file for the reader");
-    command->callback([&] { code = get(options); });
-
-    command = app.add_subcommand("set", "sets properties and prints what they are then");
-    command->add_option("assignment", options.names, "DEVICE:PROPERTY=VALUE")->required();
-    command->add_option("--input", options.input, "a file for the reader");
-    command->callback([&] { code = set(options); });
-
-    command = app.add_subcommand("watch", "plays, and prints properties when they change");
-    command->add_option("input", options.input, INPUT_HELP)->required();
-    command->add_option("property", options.names, "DEVICE:PROPERTY")->required();
-    addShowOptions(*command, options);
-    command->callback([&] { code = watch(options); });
-
-    command = app.add_subcommand("graph", "prints devices, streams and sequence for Graphviz");
-    command->add_option("input", options.input, "as for play, or a pipeline file (.pipeline)")
-        ->required();
-    command->callback([&] { code = graph(options); });
-
-    command = app.add_subcommand("run", "plays what a text file describes");
-    command->add_option("file", options.input, "see docs/mediahost.md")->required();
-    command->callback([&] { code = play(Pipeline::read(options.input)); });
-
+    addShowCommands(app, options, code);
+    addDeviceCommands(app, options, code);
     try {
         app.parse(nbArguments, arguments);
     } catch (const CLI::ParseError& error) {

@@ -32,8 +32,8 @@ void useProperties(DevMgr& manager) {
 
 void watchTheMeter(DevMgr& manager) {
     //! [observer]
+    LkSema isLoud("loud", 0);  // outlives the observer, which ends with the access object
     const ObjPtr<DevMgrPropertyAcc> properties = manager.createPropertyAcc();
-    LkSema isLoud("loud", 0);
     const auto observer =
         DevMgrPropertyFunctionObserver::create([&](const DevMgrPropertyObserverHint& hint) {
             double peak = 0;

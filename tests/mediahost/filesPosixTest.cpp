@@ -138,6 +138,58 @@ TEST_F(MediaHostFiles, playsFilesWithoutSoundOrWithoutPictures) {
     EXPECT_FALSE(std::filesystem::exists(blind / "frames.txt"));
 }
 
+/// How alike two films are, in dB; 0 if they cannot be compared.
+double comparePictures(const std::string& one, const std::string& other) {
+    const std::string log = runCommand("ffmpeg -nostdin -v info -i " + quote(one) + " -i " +
+                                       quote(other) + " -lavfi psnr -f null - 2>&1")
+                                .output;
+    const std::size_t at = log.rfind("average:");
+    return at == std::string::npos ? 0 : std::strtod(log.c_str() + at + 8, nullptr);
+}
+
+TEST_F(MediaHostFiles, encodesWhatItPlaysAsAFilm) {
+    const TestFolder out;
+    for (const char* name : {"film.avi", "film.mkv"}) {
+        const HostRun run =
+            runHost("play " + get("h264.mp4") + " --encode " + name + " --out " + out.getPath());
+        ASSERT_EQ(run.code, 0) << run.output;
+        EXPECT_EQ(decodePictures(out / name).size(), 75u) << name;
+        EXPECT_GT(comparePictures(get("h264.mp4"), out / name), 30) << name;
+    }
+    const HostRun run =
+        runHost("play " + get("h264.mp4") + " --encode film.doc --out " + out.getPath());
+    EXPECT_EQ(run.code, 1) << run.output;
+    EXPECT_THAT(run.output, HasSubstr("expected a name that ends as films do"));
+    EXPECT_EQ(out.list(), (std::vector<std::string>{"contact-sheet.png", "film.avi", "film.mkv",
+                                                    "report.xml", "sound.wav", "waveform.png"}));
+}
+
+// SDL's own stand-ins for a display and a loudspeaker take everything at the pace of real ones.
+TEST_F(MediaHostFiles, showsAndPlaysLiveWithoutChangingWhatIsRecorded) {
+    const TestFolder out;
+    const HostRun run = runCommand(
+        "SDL_VIDEODRIVER=dummy SDL_AUDIODRIVER=dummy ./orv-mediahost play simulated:64x48@25,1"
+        " --window --sound --out " +
+        out.getPath() + " 2>&1");
+    EXPECT_NE(run.code, 1) << run.output;
+    const std::string report = readFile(out / "report.xml");
+    EXPECT_THAT(report, HasSubstr("rate=\"realtime\""));
+    const std::size_t speaker = report.find("name=\"speaker\"");
+    ASSERT_NE(speaker, std::string::npos);
+    const auto read = [&](const std::string& property) {
+        const std::size_t at = report.find("name=\"" + property + '"', speaker);
+        return std::atoi(report.c_str() + report.find("value=\"", at) + 7);
+    };
+    EXPECT_GT(read("played"), 0);
+    EXPECT_EQ(read("played") + read("dropped"), 48000);
+    EXPECT_EQ(readWave(out / "sound.wav").samples.size(), 2u * 48000);
+    // No such device is an error that says so.
+    const HostRun deaf =
+        runCommand("SDL_AUDIODRIVER=none ./orv-mediahost play simulated:64x48@25,1 --sound 2>&1");
+    EXPECT_EQ(deaf.code, 1) << deaf.output;
+    EXPECT_THAT(deaf.output, HasSubstr("sound cannot be heard: "));
+}
+
 TEST_F(MediaHostFiles, scalesPicturesWhereTheirSizeChangesOnTheWay) {
     const TestFolder folder;
     for (const char* size : {"160x120", "320x240"}) {

@@ -156,15 +156,24 @@ TEST(MediaHost, leavesAllThatWasAskedForAndNothingElse) {
     EXPECT_THAT(readFile(folder / "trace.json"), HasSubstr("\"display\""));
 }
 
+double readAttribute(const std::string& xml, const std::string& name) {
+    const std::size_t at = xml.find(' ' + name + "=\"");
+    return at == std::string::npos ? -1 : std::strtod(xml.c_str() + at + name.size() + 3, nullptr);
+}
+
 TEST(MediaHost, keepsTheTimeOfAPacedShow) {
     const TestFolder folder;
-    const HostRun run = runHost("play simulated:64x48@50,1 --rate 2 --out " + folder.getPath());
-    ASSERT_EQ(run.code, 0) << run.output;
-    EXPECT_THAT(run.output, HasSubstr("50 shown, 0 dropped"));
+    const HostRun run =
+        runHost("play simulated:64x48@50,1 --rate 2 --checksums --out " + folder.getPath());
     const std::string report = readFile(folder / "report.xml");
-    const std::size_t at = report.find("seconds=\"") + 9;
+    // A machine that is busy with other things may be late for a picture, but says so.
+    const double nbDropped = readAttribute(report, "dropped");
+    EXPECT_EQ(run.code, nbDropped > 0 ? 2 : 0) << run.output;
+    EXPECT_EQ(readAttribute(report, "pictures") + nbDropped, 50) << run.output;
+    EXPECT_EQ(readFrames(folder / "frames.txt").size(), readAttribute(report, "pictures"));
+    EXPECT_EQ(readWave(folder / "sound.wav").samples.size(), 2u * 48000);
     // At twice the speed the last picture is due after 0.49 seconds, and not before.
-    EXPECT_GE(std::strtod(report.c_str() + at, nullptr), 0.48);
+    EXPECT_GE(readAttribute(report, "seconds"), 0.48);
 }
 
 TEST(MediaHost, tellsWhatIsWrongWithWhatItIsAskedFor) {
@@ -219,8 +228,9 @@ TEST(MediaHost, showsAndSetsPropertiesOfItsDevices) {
                 HasSubstr("mixer:channel4:gain = -2.5"));
     const HostRun watch = runHost("watch simulated:32x32@25,1 pattern:position mixer:master:peak");
     EXPECT_EQ(watch.code, 0);
-    EXPECT_THAT(watch.output, HasSubstr("pattern:position = "));
-    // The click at the begin may be over when the notice of it is read; the tone stays.
+    EXPECT_THAT(watch.output, HasSubstr("pattern:position = 24\n"));
+    // The click at the begin may be over when the notice of it is read; the tone stays to the end,
+    // when what has not been told yet is.
     EXPECT_THAT(watch.output, HasSubstr("mixer:master:peak = -12.04"));
     const HostRun graph = runHost("graph simulated");
     EXPECT_THAT(graph.output, HasSubstr("\"mixer\" -> \"scope\" [label=\"out\"]"));
@@ -243,7 +253,8 @@ constexpr const char* TWO_TONES =
 TEST(MediaHost, playsWhatATextFileDescribes) {
     const TestFolder folder;
     const std::string path = folder / "tones.pipeline";
-    writeFile(path, TWO_TONES + std::string("out \"") + (folder / "out") + "\"\n");
+    // A device that takes no part, named as a piece of the name of one that does.
+    writeFile(path, TWO_TONES + std::string("device be tone\nout \"") + (folder / "out") + "\"\n");
     const HostRun run = runHost("run " + path);
     ASSERT_EQ(run.code, 0) << run.output;
     const Wave wave = readWave(folder / "out/sound.wav");

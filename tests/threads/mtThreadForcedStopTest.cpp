@@ -10,9 +10,11 @@
 #include "threadTesting.h"
 
 #if defined(ORV_TEST_SANITIZED)
-/// What a thread that is ended by force had is lost: its log queue, and what its body made.
+/// What a thread that is ended by force had is lost: its log queue, its waiter (which a thread before it
+/// may have made), and what its body made.
 extern "C" const char* __lsan_default_suppressions() {
-    return "leak:Orv::LgRegistry::registerThread\nleak:MtThreadForcedStop_\n";
+    return "leak:Orv::LgRegistry::registerThread\nleak:Orv::LkWaiterPool::take\n"
+           "leak:MtThreadForcedStop_\n";
 }
 #endif
 

@@ -1,6 +1,7 @@
 #include "hostContext.h"
 
 #include <orv/lkGuard.h>
+#include <orv/mbArenaManager.h>
 #include <orv/mbHeapManager.h>
 #include <orv/mbUnloadLRU.h>
 #include <orv/mbUnloadRandom.h>
@@ -13,7 +14,6 @@ namespace MediaHost {
 namespace {
 
 constexpr std::uint64_t SOUND_BYTES = 4 << 20;
-constexpr std::uint64_t MOST_PADDING = 64;  // of a buffer's alignment
 
 Orv::ObjPtr<Orv::MbUnloadStrategy> createStrategy(bool isRandom) {
     if (isRandom) return Orv::ObjPtr<Orv::MbUnloadStrategy>(new Orv::MbUnloadRandom(256));
@@ -28,8 +28,20 @@ Orv::RCShdPtr<Orv::MbManager> HostContext::getPictures(std::uint64_t unitBytes) 
         if (cachePictures > 0) {
             cacheBytes = static_cast<std::uint64_t>(cachePictures) * (unitBytes + MOST_PADDING);
         }
-        _pictures.reset(
-            new Orv::MbHeapManager("pictures", cacheBytes, createStrategy(isCacheRandom)));
+        if (unitBytes + MOST_PADDING > cacheBytes) {
+            throw MediaError("one picture takes " + std::to_string(unitBytes + MOST_PADDING) +
+                             " bytes, the cache has only " + std::to_string(cacheBytes) +
+                             "; give it more with --cache");
+        }
+        // One block whose pages stay: pictures come and go all the time, and are of one size.
+        try {
+            _pictures.reset(new Orv::MbArenaManager(
+                "pictures", Orv::DaArenaPool::create(cacheBytes, Orv::DaPages::HUGE_IF_OFFERED),
+                createStrategy(isCacheRandom)));
+        } catch (...) {
+            throwBecause("there is no memory for a cache of " + std::to_string(cacheBytes) +
+                         " bytes; give it less with --cache");
+        }
     }
     return _pictures;
 }

@@ -34,6 +34,7 @@ struct HostContext {
     Pacer pacer;
 
     // Memory, made for the first source that asks:
+    /// @throws MediaError if not even one unit of that size fits into the budget.
     Orv::RCShdPtr<Orv::MbManager> getPictures(std::uint64_t unitBytes);
     Orv::RCShdPtr<Orv::MbManager> getSounds();
     Orv::MbManagerStatistics getCacheStatistics() const;
@@ -56,6 +57,8 @@ struct HostContext {
     void waitForNews(double seconds);
 
 private:
+    static constexpr std::uint64_t MOST_PADDING = 72;  // of a buffer, for its alignment
+
     mutable Orv::LkMutex _mutex{"HostContext"};
     Orv::RCShdPtr<Orv::MbManager> _pictures, _sounds;
     std::atomic<double> _firstPictureSeconds{0};  // since the program's start

@@ -7,15 +7,26 @@
 
 namespace MediaHost {
 
+namespace {
+
+double getNow() {
+    return std::chrono::duration<double>(std::chrono::steady_clock::now().time_since_epoch())
+        .count();
+}
+
+}  // namespace
+
 void Pacer::startUnpaced() {
     const Orv::LkGuard guard(_mutex);
     _state = State::UNPACED;
+    _startSeconds = getNow();
     _changed.broadcast();
 }
 
 void Pacer::startPaced(double beatsPerSecond, double speed) {
     const Orv::LkGuard guard(_mutex);
     _state = State::PACED;
+    _startSeconds = getNow();
     _beatsPerSecond = beatsPerSecond;
     _speed = speed;
     _offsets.reserve(NB_KEPT);
@@ -34,8 +45,7 @@ void Pacer::wakeAll() {
 }
 
 void Pacer::setBeat(std::uint64_t beat) {
-    const double now =
-        std::chrono::duration<double>(std::chrono::steady_clock::now().time_since_epoch()).count();
+    const double now = getNow();
     const Orv::LkGuard guard(_mutex);
     _beat = beat;
     const double offset = now - static_cast<double>(beat) / (_beatsPerSecond * _speed);
@@ -67,6 +77,11 @@ bool Pacer::waitFor(double seconds, const std::atomic<bool>& isStopped) {
 bool Pacer::isOverdue(double seconds) const {
     const Orv::LkGuard guard(_mutex);
     return _state == State::PACED && _beat > findBeat(seconds) + 1;
+}
+
+double Pacer::getSecondsSinceStart() const {
+    const Orv::LkGuard guard(_mutex);
+    return _startSeconds > 0 ? getNow() - _startSeconds : 0;
 }
 
 double Pacer::getSeconds() const {

@@ -35,7 +35,8 @@ public:
     /// Whether that was due more than one whole beat ago.
     bool isOverdue(double seconds) const;
 
-    double getSeconds() const;     ///< The beats until now, as time.
+    double getSecondsSinceStart() const;  ///< As time went by; 0 before the start.
+    double getSeconds() const;            ///< The beats until now, as time.
     Lateness getLateness() const;  ///< Of the latest beats, measured against the steadiest of them.
 
 private:
@@ -45,6 +46,7 @@ private:
     mutable Orv::LkMutex _mutex{"Pacer"};
     Orv::LkCondVar _changed{"Pacer changed"};
     State _state = State::HELD;
+    double _startSeconds = 0;  // by the clock that does not jump
     double _beatsPerSecond = 1;
     double _speed = 1;
     bool _hasBeaten = false;

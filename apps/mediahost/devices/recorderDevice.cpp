@@ -9,8 +9,13 @@ namespace MediaHost {
 RecorderDevice::RecorderDevice(const Orv::LiString& name, HostContext& context, Settings settings)
     : MediaDevice(name, context),
       _hasFrames(settings.getNumber("frames", 0, 0, 1) == 1),
-      _hasChecksums(settings.getNumber("checksums", 0, 0, 1) == 1) {
+      _hasChecksums(settings.getNumber("checksums", 0, 0, 1) == 1),
+      _filmName(settings.getText("encode", "")) {
     settings.check();
+    if (!_filmName.empty() && context.folder.empty()) {
+        throw MediaError("there is no folder for the film \"" + _filmName +
+                         "\"; give one with --out");
+    }
     addInput<SoundBuf>("audio", "sound/*",
                        [this](const Orv::RCShdPtr<SoundBuf>& buf) { takeSound(buf); });
     addInput<PictureBuf>("video", "picture/*",
@@ -36,6 +41,7 @@ void RecorderDevice::takePicture(const Orv::RCShdPtr<PictureBuf>& buf) {
     if (!getContext().folder.empty()) {
         if (_hasFrames) writePicture(*buf);
         if (_hasChecksums) writeChecksum(*buf);
+        if (!_filmName.empty()) encode(*buf);
     }
     ++_nbPictures;
 }
@@ -58,20 +64,33 @@ void RecorderDevice::writeChecksum(const PictureBuf& buf) {
                       getChecksum(buf.getData(), buf.getFormat().nbBytes) + '\n');
 }
 
+void RecorderDevice::encode(const PictureBuf& buf) {
+    if (!_film) {
+        _film = std::make_unique<EncodedFile>(getContext().folder / _filmName, buf.getFormat());
+    }
+    _film->write(buf.getFormat(), buf.getData());
+}
+
 void RecorderDevice::finish(bool isWhole) {
     if (!isWhole) {
-        _sound.reset();
-        _checksums.reset();
+        dropFiles();
         return;
     }
     if (_sound) _sound->commit();
     if (_checksums) _checksums->commit();
+    if (_film) _film->commit();
 }
 
 void RecorderDevice::close() {
+    dropFiles();
+    MediaDevice::close();
+}
+
+// Those that are whole have their names already and stay.
+void RecorderDevice::dropFiles() {
     _sound.reset();
     _checksums.reset();
-    MediaDevice::close();
+    _film.reset();
 }
 
 }  // namespace MediaHost

@@ -70,11 +70,6 @@ void SourceDevice::addProperties() {
 void SourceDevice::addPictures(std::unique_ptr<UnitDecoder> decoder, const PictureFormat& format) {
     const std::uint64_t unitBytes = decoder->getUnitBytes();
     const Orv::RCShdPtr<Orv::MbManager> manager = getContext().getPictures(unitBytes);
-    if (unitBytes > getContext().cacheBytes) {
-        throw MediaError("one picture takes " + std::to_string(unitBytes) +
-                         " bytes, the cache has only " + std::to_string(getContext().cacheBytes) +
-                         "; give it more with --cache");
-    }
     _pictureFormat = std::make_shared<const PictureFormat>(format);
     _pictures = std::make_unique<Track>(getName() + " pictures", std::move(decoder), manager);
     const auto nbFit = static_cast<std::int64_t>(getContext().cacheBytes / unitBytes);
@@ -149,11 +144,11 @@ bool SourceDevice::playOnce(Loop& loop, Track& track, std::int64_t nbAhead, bool
         if (!origin) origin = seconds;
         due = base + std::abs(seconds - *origin);
         if (!getContext().pacer.waitFor(due, _isStopped)) return false;
-        if (mayDrop && getContext().pacer.isOverdue(due)) {
-            ++_nbDropped;
-            continue;
-        }
-        if (!push(loop, std::move(guard), unit)) return false;
+        const bool isDropped = mayDrop && getContext().pacer.isOverdue(due);
+        if (isDropped) ++_nbDropped;
+        if (!isDropped && !push(loop, std::move(guard), unit)) return false;
+        // What is shown once keeps no memory; what comes again stays as long as there is room.
+        if (getContext().nbLoops == 1) track.letGo(unit);
     }
     if (!origin) return false;  // nothing there at all
     base = due + (mayDrop ? 1 / _pictureFormat->rate.toDouble()

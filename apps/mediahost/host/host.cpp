@@ -1,6 +1,7 @@
 #include "host.h"
 
 #include <algorithm>
+#include <cstring>
 #include <iostream>
 #include <orv/devMgrEx.h>
 #include <orv/devMgrPropertyObserverUtil.h>
@@ -10,6 +11,7 @@
 #include <orv/liTimeCodeNtscDf.h>
 #include <orv/liTimeCodeNtscNd.h>
 #include <orv/liTimeCodePal.h>
+#include <orv/lkGuard.h>
 
 #include "clockDevice.h"
 #include "displayDevice.h"
@@ -21,12 +23,12 @@
 #include "recorderDevice.h"
 #include "scopeDevice.h"
 #include "simulatedDevices.h"
+#include "speakerDevice.h"
 
 namespace MediaHost {
 
 namespace {
 
-constexpr double STOP_SECONDS = 10;  // what a sequence may take to stop before it is aborted
 constexpr double GET_SECONDS = 2;
 
 using Entry = Orv::ObjPtr<Orv::DevRegistryEntry>;
@@ -49,7 +51,9 @@ const std::pair<DeviceKind, Create> KINDS[] = {
      createEntry<MixerDevice>},
     {{"scope", "levels of the sound, and a picture of its waveform"}, createEntry<ScopeDevice>},
     {{"display", "a window, and a contact sheet of the pictures"}, createEntry<DisplayDevice>},
-    {{"recorder", "writes sound as WAV, and pictures as PNG"}, createEntry<RecorderDevice>},
+    {{"speaker", "lets the sound be heard"}, createEntry<SpeakerDevice>},
+    {{"recorder", "writes sound as WAV, and pictures as PNG or as a film"},
+     createEntry<RecorderDevice>},
     {{"clock", "beats the time for all others, by the sync engine"}, createEntry<ClockDevice>},
 };
 
@@ -81,6 +85,30 @@ const std::vector<DeviceKind>& listKinds() {
     return KINDS_ONLY;
 }
 
+/// A property that is printed when it has changed.
+class Host::Watch {
+public:
+    Watch(const std::string& name, const Orv::RCShdPtr<Orv::DevMDPropertyAny>& property)
+        : _name(name), _property(property) {}
+
+    // What is read is the value of now, so several notices in a row may find the same one.
+    void print() {
+        const Orv::LkGuard guard(_mutex);
+        std::string value = PropertyText::get(_property, GET_SECONDS);
+        if (value == _last) return;
+        std::cout << std::to_string(Process::getSecondsSinceStart()) + " s  " + _name + " = " +
+                         value + '\n'
+                  << std::flush;
+        _last = std::move(value);
+    }
+
+private:
+    const std::string _name;
+    const Orv::RCShdPtr<Orv::DevMDPropertyAny> _property;
+    Orv::LkMutex _mutex{"Watch"};
+    std::string _last;
+};
+
 Host::Host(Pipeline pipeline) : _pipeline(std::move(pipeline)) {
     applyOptions();
 }
@@ -88,6 +116,7 @@ Host::Host(Pipeline pipeline) : _pipeline(std::move(pipeline)) {
 Host::~Host() {
     // In the order in which one uses the other; the manager closes the devices.
     _watches.reset();
+    _watched.clear();
     _sequence.reset();
     _context.pacer.stop();
     _streams.reset();
@@ -194,18 +223,13 @@ void Host::setProperty(const std::string& property, const std::string& value) {
 
 void Host::watch(const std::string& property) {
     doing("cannot watch the property \"" + property + '"', [&] {
-        // What is read is the value of now, so several notices in a row may find the same one.
-        const auto print =
-            [property, last = std::string()](const Orv::DevMgrPropertyObserverHint& hint) mutable {
-                std::string value = PropertyText::get(hint.getProperty(), GET_SECONDS);
-                if (value == last) return;
-                const std::string line = std::to_string(Process::getSecondsSinceStart()) + " s  " +
-                                         property + " = " + value + '\n';
-                last = std::move(value);
-                std::cout << line << std::flush;
-            };
+        const auto watched =
+            std::make_shared<Watch>(property, _watches->getProperty(property.c_str()));
         Orv::DevMgrPropertyObserverUtil::attachObserver(
-            *_watches, property.c_str(), Orv::DevMgrPropertyFunctionObserver::create(print));
+            *_watches, property.c_str(),
+            Orv::DevMgrPropertyFunctionObserver::create(
+                [watched](const Orv::DevMgrPropertyObserverHint&) { watched->print(); }));
+        _watched.push_back(watched);
     });
 }
 
@@ -234,6 +258,7 @@ void Host::connectStandard() {
     };
     const auto* mixer = find("mixer");
     const auto* scope = find("scope");
+    const auto* speaker = find("speaker");
     const auto* display = find("display");
     const auto* recorder = find("recorder");
     int nbChannels = 0;
@@ -256,8 +281,13 @@ void Host::connectStandard() {
     }
     if (nbChannels > 0 && scope != nullptr) {
         _pipeline.connect(mixer->name + ":out push " + scope->name + ":audio");
+        const auto* last = scope;
+        if (speaker != nullptr) {
+            _pipeline.connect(last->name + ":through push " + speaker->name + ":audio");
+            last = speaker;
+        }
         if (recorder != nullptr) {
-            _pipeline.connect(scope->name + ":through push " + recorder->name + ":audio");
+            _pipeline.connect(last->name + ":through push " + recorder->name + ":audio");
         }
     }
 }
@@ -265,7 +295,8 @@ void Host::connectStandard() {
 // One below the other, those that take below nobody but the clock, sources last: so what a device
 // needs is started before it and stopped after it.
 std::string Host::makeTree() const {
-    static const char* const ORDER[] = {"clock", "recorder", "scope", "mixer", "display"};
+    static const char* const ORDER[] = {"clock", "recorder", "speaker",
+                                        "scope", "mixer",    "display"};
     std::vector<std::string> leaders;
     std::string sources;
     for (const char* kind : ORDER) {
@@ -284,16 +315,30 @@ std::string Host::makeTree() const {
     return tree + std::string(leaders.size(), ')');
 }
 
+bool Host::isInSequence(const std::string& device) const {
+    const auto isEdge = [this](std::size_t at) {
+        return at >= _tree.size() || std::strchr("() ", _tree[at]) != nullptr;
+    };
+    for (std::size_t at = _tree.find(device); at != std::string::npos;
+         at = _tree.find(device, at + 1)) {
+        if ((at == 0 || isEdge(at - 1)) && isEdge(at + device.size())) return true;
+    }
+    return false;
+}
+
 bool Host::play() {
     _sequence->start();
     _sequence->sync(Orv::DtTime(0.0));
     bool isWhole = waitInStep();
-    const double began = Process::getSecondsSinceStart();
     if (isWhole) isWhole = waitForEnd();
-    _playedSeconds = Process::getSecondsSinceStart() - began;
+    _playedSeconds = _context.pacer.getSecondsSinceStart();
+    if (!isWhole) {
+        std::cout << "interrupted: stopping in order; once more ends at once" << std::endl;
+    }
     stop();
     _streams.reset();
     _watches.reset();
+    for (const auto& watched : _watched) watched->print();  // the notice of it may still be due
     _context.rethrowFailure();
     return isWhole;
 }
@@ -306,7 +351,7 @@ bool Host::waitFor(const char* state, double seconds) {
         _context.rethrowFailure();  // a device's own words are better
         std::string failures = "the sequence \"" + _tree + "\" has failed";
         for (const Pipeline::Device& device : _pipeline.devices) {
-            if (_tree.find(device.name) == std::string::npos) continue;
+            if (!isInSequence(device.name)) continue;
             const Orv::LiString failure = _sequence->getFailure(device.name.c_str());
             if (!failure.isEmpty()) failures += "; " + device.name + ": " + failure.getChars();
         }
@@ -338,11 +383,16 @@ bool Host::waitForEnd() {
 
 void Host::stop() {
     _sequence->stop();
-    if (waitFor("final", STOP_SECONDS)) return;
+    if (waitFor("final", _pipeline.patienceSeconds)) return;
     _sequence->abort();
-    if (!waitFor("final", STOP_SECONDS)) {
-        throw MediaError("the devices do not stop; " + _tree + " was given up");
+    if (waitFor("final", _pipeline.patienceSeconds)) return;
+    std::string states;
+    for (const Pipeline::Device& device : _pipeline.devices) {
+        if (!isInSequence(device.name)) continue;
+        const std::string state = _sequence->getState(device.name.c_str()).getChars();
+        if (state != "final") states += ", " + device.name + " is in \"" + state + '"';
     }
+    throw DevicesHang("the devices do not stop and were given up" + states);
 }
 
 }  // namespace MediaHost

@@ -10,6 +10,7 @@
 
 #include "hostContext.h"
 #include "mediaDevice.h"
+#include "mediaError.h"
 #include "pipeline.h"
 
 namespace MediaHost {
@@ -19,6 +20,12 @@ struct DeviceKind {
     const char* description;
 };
 const std::vector<DeviceKind>& listKinds();
+
+/// A device is stuck in a call that does not return; the host that it belongs to cannot go.
+class DevicesHang : public MediaError {
+public:
+    using MediaError::MediaError;
+};
 
 /// Builds what a pipeline describes, on a device manager, and plays it.
 ///
@@ -38,13 +45,15 @@ public:
 
     /// Plays to the end, or until an interrupt; the files are finished either way.
     /// @return false if it was interrupted.
+    /// @throws DevicesHang if it does not stop in time: then leave the host where it is.
     bool play();
 
     const Pipeline& getPipeline() const { return _pipeline; }
     const HostContext& getContext() const { return _context; }
     const std::vector<std::string>& getConnections() const { return _connections; }
     const std::string& getTree() const { return _tree; }
-    double getPlayedSeconds() const { return _playedSeconds; }  ///< From in step to the last end.
+    bool isInSequence(const std::string& device) const;
+    double getPlayedSeconds() const { return _playedSeconds; }  ///< From the start to the last end.
 
     Orv::RCShdPtr<Orv::DevMDPrtcl> getDevice(const std::string& name);
     Orv::DevMgrPropertyAcc& getProperties() { return *_properties; }
@@ -55,6 +64,8 @@ public:
     void watch(const std::string& property);  ///< Prints it whenever it changes.
 
 private:
+    class Watch;
+
     Pipeline _pipeline;
     HostContext _context;
     std::vector<std::string> _registered;
@@ -63,6 +74,7 @@ private:
     Orv::ObjPtr<Orv::DevMgrPropertyAcc> _watches;  // goes first: observers use the other
     Orv::ObjPtr<Orv::DevMgrStreamAcc> _streams;
     Orv::ObjPtr<Orv::DevMgrSyncSeqAcc> _sequence;
+    std::vector<std::shared_ptr<Watch>> _watched;
     std::vector<std::string> _connections;
     std::string _tree;
     double _playedSeconds = 0;

@@ -122,6 +122,8 @@ private:
              [](Reader& r, const Words& w) { r._pipeline.setTimecode(only(w, "a timecode")); }},
             {"rate", [](Reader& r, const Words& w) { r._pipeline.setRate(only(w, "a rate")); }},
             {"loops", [](Reader& r, const Words& w) { r._pipeline.setLoops(only(w, "a number")); }},
+            {"patience",
+             [](Reader& r, const Words& w) { r._pipeline.setPatience(only(w, "a number")); }},
             {"reverse",
              [](Reader& r, const Words& w) {
                  if (w.size() != 1) expect("nothing behind \"reverse\"", join(w, 1));
@@ -135,7 +137,7 @@ private:
         if (found == TAKES.end()) {
             expect(
                 "device, connect, sequence, set, watch, cache, strategy, timecode, rate, loops, "
-                "reverse, out or trace",
+                "patience, reverse, out or trace",
                 words[0]);
         }
         found->second(*this, words);
@@ -216,6 +218,12 @@ void Pipeline::setRate(const std::string& text) {
 void Pipeline::setLoops(const std::string& text) {
     if (!parseAll(text, nbLoops) || nbLoops < 0) {
         expect("how often to play, from 1 on, or 0 for ever", text);
+    }
+}
+
+void Pipeline::setPatience(const std::string& text) {
+    if (!parseAll(text, patienceSeconds) || !(patienceSeconds >= 0) || !(patienceSeconds <= 1e6)) {
+        expect("seconds", text);
     }
 }
 

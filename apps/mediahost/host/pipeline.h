@@ -36,6 +36,7 @@ struct Pipeline {
     std::string rate = "fast";  ///< "fast", "realtime" or a multiple of it
     bool isReverse = false;
     std::int64_t nbLoops = 1;
+    double patienceSeconds = 10;   ///< What a stop, and then an abort, may take.
     std::filesystem::path folder;  ///< Empty: nothing is written.
     std::filesystem::path trace;   ///< Empty: none.
 
@@ -50,6 +51,7 @@ struct Pipeline {
     void setTimecode(const std::string& text);
     void setRate(const std::string& text);
     void setLoops(const std::string& text);
+    void setPatience(const std::string& text);
 
     /// Reads a text file, of which docs/mediahost.md tells the form.
     /// @throws MediaError that names file, line and what was expected.

@@ -3,7 +3,6 @@
 #include <cmath>
 #include <iomanip>
 #include <orv/buildInfo.h>
-#include <orv/xmlStreamer.h>
 #include <ostream>
 
 #include "outputFile.h"
@@ -13,8 +12,6 @@
 namespace MediaHost {
 
 namespace {
-
-using Element = Orv::XmlStreamer::ElementGuard;
 
 constexpr double GET_SECONDS = 2;
 
@@ -38,7 +35,7 @@ Report::Report(Host& host, bool isWhole)
 
 void Report::collect(const Pipeline::Device& spec) {
     Device device{spec.name, spec.kind, 0, {}};
-    if (_host.getTree().find(spec.name) != std::string::npos) {
+    if (_host.isInSequence(spec.name)) {
         device.latencySeconds = _host.getSequence().getLatency(spec.name.c_str()).getSeconds();
     }
     const auto prtcl =
@@ -137,62 +134,15 @@ void Report::print(std::ostream& stream) const {
 }
 
 void Report::write(const std::filesystem::path& path) const {
-    const HostContext& context = _host.getContext();
-    const Orv::MbManagerStatistics cache = context.getCacheStatistics();
     OutputFile file(path);
     {
         Orv::XmlStreamer streamer(file.getStream(), true);
         Element root(streamer, "mediahost");
         root.addAttribute("library", Orv::BuildInfo::getInstance().getVersion());
         root.addAttribute("whole", _isWhole ? "true" : "false");
-        {
-            Element show(root, "show");
-            show.addAttribute("rate", _host.getPipeline().rate.c_str());
-            show.addAttribute("timecode", _host.getPipeline().timecode.c_str());
-            show.addAttribute("sequence", _host.getTree().c_str());
-            show.addAttribute("seconds", _host.getPlayedSeconds());
-            show.addAttribute("pictures", static_cast<long long>(_nbShown));
-            show.addAttribute("dropped", static_cast<long long>(_nbDropped));
-            show.addAttribute("decoded", static_cast<long long>(_nbDecoded));
-            show.addAttribute("soundSeconds", _soundSeconds);
-            show.addAttribute("firstPictureSeconds", context.getFirstPictureSeconds());
-        }
-        {
-            Element element(root, "cache");
-            element.addAttribute("strategy", _host.getPipeline().strategy.c_str());
-            element.addAttribute("budgetBytes",
-                                 static_cast<unsigned long long>(context.cacheBytes));
-            element.addAttribute("hits", static_cast<unsigned long long>(cache.counts.nbHits));
-            element.addAttribute("loads", static_cast<unsigned long long>(cache.counts.nbReloads));
-            element.addAttribute("evictions",
-                                 static_cast<unsigned long long>(cache.counts.nbEvictions));
-        }
-        if (context.isPaced) {
-            const Pacer::Lateness late = context.pacer.getLateness();
-            Element element(root, "beats");
-            element.addAttribute("number", static_cast<unsigned long long>(late.nbBeats));
-            element.addAttribute("p50Seconds", late.p50Seconds);
-            element.addAttribute("p99Seconds", late.p99Seconds);
-            element.addAttribute("maxSeconds", late.maxSeconds);
-        }
-        {
-            Element element(root, "process");
-            element.addAttribute("peakBytes", static_cast<unsigned long long>(_peakBytes));
-            element.addAttribute("processorSeconds", _processorSeconds);
-        }
-        for (const Device& device : _devices) {
-            Element element(root, "device");
-            element.addAttribute("name", device.name.c_str());
-            element.addAttribute("kind", device.kind.c_str());
-            element.addAttribute("inStepAfterSeconds", device.latencySeconds);
-            for (const Property& property : device.properties) {
-                Element child(element, "property");
-                child.addAttribute("name", property.name.c_str());
-                child.addAttribute("type", property.type.c_str());
-                if (!property.unit.empty()) child.addAttribute("unit", property.unit.c_str());
-                child.addAttribute("value", property.value.c_str());
-            }
-        }
+        writeShow(root);
+        writeMachine(root);
+        for (const Device& device : _devices) writeDevice(root, device);
         for (const std::string& connection : _host.getConnections()) {
             Element element(root, "connection");
             element.addAttribute("string", connection.c_str());
@@ -203,6 +153,58 @@ void Report::write(const std::filesystem::path& path) const {
         }
     }
     file.commit();
+}
+
+void Report::writeShow(Element& root) const {
+    const HostContext& context = _host.getContext();
+    Element show(root, "show");
+    show.addAttribute("rate", _host.getPipeline().rate.c_str());
+    show.addAttribute("timecode", _host.getPipeline().timecode.c_str());
+    show.addAttribute("sequence", _host.getTree().c_str());
+    show.addAttribute("seconds", _host.getPlayedSeconds());
+    show.addAttribute("pictures", static_cast<long long>(_nbShown));
+    show.addAttribute("dropped", static_cast<long long>(_nbDropped));
+    show.addAttribute("decoded", static_cast<long long>(_nbDecoded));
+    show.addAttribute("soundSeconds", _soundSeconds);
+    show.addAttribute("firstPictureSeconds", context.getFirstPictureSeconds());
+}
+
+void Report::writeMachine(Element& root) const {
+    const HostContext& context = _host.getContext();
+    {
+        const Orv::MbBufferStatistics counts = context.getCacheStatistics().counts;
+        Element element(root, "cache");
+        element.addAttribute("strategy", _host.getPipeline().strategy.c_str());
+        element.addAttribute("budgetBytes", static_cast<unsigned long long>(context.cacheBytes));
+        element.addAttribute("hits", static_cast<unsigned long long>(counts.nbHits));
+        element.addAttribute("loads", static_cast<unsigned long long>(counts.nbReloads));
+        element.addAttribute("evictions", static_cast<unsigned long long>(counts.nbEvictions));
+    }
+    if (context.isPaced) {
+        const Pacer::Lateness late = context.pacer.getLateness();
+        Element element(root, "beats");
+        element.addAttribute("number", static_cast<unsigned long long>(late.nbBeats));
+        element.addAttribute("p50Seconds", late.p50Seconds);
+        element.addAttribute("p99Seconds", late.p99Seconds);
+        element.addAttribute("maxSeconds", late.maxSeconds);
+    }
+    Element element(root, "process");
+    element.addAttribute("peakBytes", static_cast<unsigned long long>(_peakBytes));
+    element.addAttribute("processorSeconds", _processorSeconds);
+}
+
+void Report::writeDevice(Element& root, const Device& device) {
+    Element element(root, "device");
+    element.addAttribute("name", device.name.c_str());
+    element.addAttribute("kind", device.kind.c_str());
+    element.addAttribute("inStepAfterSeconds", device.latencySeconds);
+    for (const Property& property : device.properties) {
+        Element child(element, "property");
+        child.addAttribute("name", property.name.c_str());
+        child.addAttribute("type", property.type.c_str());
+        if (!property.unit.empty()) child.addAttribute("unit", property.unit.c_str());
+        child.addAttribute("value", property.value.c_str());
+    }
 }
 
 namespace {

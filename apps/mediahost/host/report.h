@@ -1,5 +1,6 @@
 #pragma once
 
+#include <orv/xmlStreamer.h>
 #include <string>
 #include <vector>
 
@@ -19,6 +20,8 @@ public:
     void write(const std::filesystem::path& path) const;  ///< As XML.
 
 private:
+    using Element = Orv::XmlStreamer::ElementGuard;
+
     struct Property {
         std::string name, type, unit, value;
     };
@@ -42,6 +45,9 @@ private:
                            const std::string& prefix);
     std::string find(const Device& device, const char* property) const;
     void count(const Device& device);
+    void writeShow(Element& root) const;
+    void writeMachine(Element& root) const;
+    static void writeDevice(Element& root, const Device& device);
 };
 
 /// All properties of a device, as lines for people.

@@ -1,6 +1,9 @@
 #include "ffmpegInput.h"
 
+#include <new>
+
 #include "mediaError.h"
+#include "process.h"
 
 extern "C" {
 #include <libavutil/log.h>
@@ -16,7 +19,10 @@ const char* nameOf(AVMediaType type) {
 
 FfmpegFormat openFile(const std::string& path) {
     av_log_set_level(AV_LOG_FATAL);  // damaged pieces are counted and reported
-    AVFormatContext* opened = nullptr;
+    AVFormatContext* opened = avformat_alloc_context();
+    if (opened == nullptr) throw std::bad_alloc();
+    // Ctrl-C ends a wait for what does not come, from a network or a pipe.
+    opened->interrupt_callback.callback = [](void*) { return Process::isInterrupted() ? 1 : 0; };
     int code = avformat_open_input(&opened, path.c_str(), nullptr, nullptr);
     if (code < 0) {
         throw MediaError("cannot open \"" + path + "\": " + describeFfmpegError(code));
@@ -99,7 +105,7 @@ bool FfmpegInput::feed() {
         const int code = av_read_frame(_format.get(), _packet.get());
         if (code < 0) {
             // A file that is cut off may end in the middle of something.
-            if (code != AVERROR_EOF) ++_nbFaults;
+            if (code != AVERROR_EOF && code != AVERROR_EXIT) ++_nbFaults;
             _isDraining = true;
             return avcodec_send_packet(_codec.get(), nullptr) >= 0;
         }

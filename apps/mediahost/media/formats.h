@@ -26,7 +26,7 @@ struct SoundFormat {
 };
 
 /// Samples per channel in a block of sound, but for the last block of a track.
-inline constexpr int BLOCK_SAMPLES = 1024;
+inline constexpr int BLOCK_SAMPLES = 2048;
 
 /// What stands before the data in the buffer of every unit.
 struct alignas(64) UnitHeader {

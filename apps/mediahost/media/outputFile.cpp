@@ -42,6 +42,12 @@ void OutputFile::write(const void* data, std::size_t nbBytes) {
     check("write");
 }
 
+void OutputFile::seek(std::uint64_t position) {
+    errno = 0;
+    _stream.seekp(static_cast<std::streamoff>(position));
+    check("write");
+}
+
 void OutputFile::writeAt(std::uint64_t position, const void* data, std::size_t nbBytes) {
     errno = 0;
     const std::ofstream::pos_type end = _stream.tellp();

@@ -19,6 +19,7 @@ public:
 
     void write(const void* data, std::size_t nbBytes);
     void write(const std::string& text) { write(text.data(), text.size()); }
+    void seek(std::uint64_t position);  ///< Where write() goes on.
     void writeAt(std::uint64_t position, const void* data, std::size_t nbBytes);
     void commit();
 

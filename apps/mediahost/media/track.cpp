@@ -73,7 +73,8 @@ Track::Track(const Orv::LiString& name, std::unique_ptr<UnitDecoder> decoder,
              const Orv::RCShdPtr<Orv::MbManager>& manager)
     : _decoder(std::move(decoder)),
       _unitBytes(_decoder->getUnitBytes()),
-      _factory(manager, nullptr, Orv::MbInitialState::UNLOADED),
+      _factory(manager, nullptr, Orv::MbInitialState::UNLOADED,
+               Orv::MbAlignment(alignof(UnitHeader) - 1, 0, 0)),
       _nbUnits(_decoder->getNbUnits().value_or(UNKNOWN)),
       _thread(Orv::MtThreadFactory::getInstance().create(
           name, Orv::MtThreadFunction::create([this] { run(); }), false, STACK_BYTES)) {
@@ -130,6 +131,15 @@ void Track::prefetch(std::int64_t first, std::int64_t nbUnits) {
     for (std::int64_t unit = std::max<std::int64_t>(first, 0); unit < end; ++unit) {
         getBuffer(unit).prefetch();
     }
+}
+
+void Track::letGo(std::int64_t unit) {
+    Orv::MbBuffer last;  // goes without the mutex
+    const Orv::LkGuard guard(_mutex);
+    const auto found = _buffers.find(unit);
+    if (found == _buffers.end()) return;
+    last = found->second;
+    _buffers.erase(found);
 }
 
 std::int64_t Track::findNbUnits() {

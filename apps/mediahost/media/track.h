@@ -42,6 +42,10 @@ public:
     /// Has units loaded ahead; those that are there become the ones used last. May wait for room.
     void prefetch(std::int64_t first, std::int64_t nbUnits);
 
+    /// The unit is not wanted again: its memory goes with the last lock. It may be fetched all the
+    /// same, and is decoded again then.
+    void letGo(std::int64_t unit);
+
     /// How many units there are; if that is not known, decodes to the end. 0 after stop().
     std::int64_t findNbUnits();
 
