@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
@@ -25,6 +26,12 @@ int toCode(int status) {
 }
 #endif
 
+// -1 with a reason in errno where the shell itself could not be started, as on a busy machine.
+int runShell(const std::string& command) {
+    errno = 0;
+    return std::system(command.c_str());
+}
+
 std::uint32_t readNumber(const std::string& bytes, std::size_t at, int nbBytes) {
     std::uint32_t number = 0;
     for (int i = nbBytes - 1; i >= 0; --i) {
@@ -46,7 +53,10 @@ HostRun runCommand(const std::string& command) {
     const std::string redirected = errors == std::string::npos
                                        ? command + " >" + path
                                        : command.substr(0, errors) + " >" + path + " 2>&1";
-    const int code = toCode(std::system(redirected.c_str()));
+    int status = runShell(redirected);
+    if (status == -1 && errno != 0) status = runShell(redirected);
+    if (status == -1) return {-1, "the shell has not run: " + std::string(std::strerror(errno))};
+    const int code = toCode(status);
     std::string output = readFile(path);
     std::erase(output, '\r');  // lines end alike on every platform
     return {code, output};

@@ -14,7 +14,10 @@ constexpr std::int64_t MOST_PICTURES_AHEAD = 16;
 // Backwards each span costs a way through all that it depends on, so it is as long as fits.
 constexpr std::int64_t MOST_PICTURES_AHEAD_REVERSE = 256;
 
-constexpr std::int64_t NB_PICTURES_ON_THEIR_WAY = 4;
+// Locked in queues and hands of the devices behind, where these are slower than the source. What
+// was loaded ahead must not give way to them.
+constexpr std::int64_t NB_PICTURES_ON_THEIR_WAY = 10;
+constexpr std::int64_t NB_PICTURES_ON_THEIR_WAY_REVERSE = 4;
 
 }  // namespace
 
@@ -73,9 +76,12 @@ void SourceDevice::addPictures(std::unique_ptr<UnitDecoder> decoder, const Pictu
     _pictureFormat = std::make_shared<const PictureFormat>(format);
     _pictures = std::make_unique<Track>(getName() + " pictures", std::move(decoder), manager);
     const auto nbFit = static_cast<std::int64_t>(getContext().cacheBytes / unitBytes);
-    const std::int64_t nbAhead = std::clamp<std::int64_t>(
-        (nbFit - NB_PICTURES_ON_THEIR_WAY) / 2, 0,
-        getContext().isReverse ? MOST_PICTURES_AHEAD_REVERSE : MOST_PICTURES_AHEAD);
+    const std::int64_t nbAhead =
+        getContext().isReverse
+            ? std::clamp<std::int64_t>((nbFit - NB_PICTURES_ON_THEIR_WAY_REVERSE) / 2, 0,
+                                       MOST_PICTURES_AHEAD_REVERSE)
+            : std::clamp<std::int64_t>((nbFit - std::min(NB_PICTURES_ON_THEIR_WAY, nbFit / 2)) / 2,
+                                       0, MOST_PICTURES_AHEAD);
     const std::string description = "picture/" + format.pixelName +
                                     ";width=" + std::to_string(format.width) +
                                     ";height=" + std::to_string(format.height);
