@@ -36,6 +36,11 @@ void SourceDevice::addProperties() {
         "position", "number of the picture shown last; set: the one to go on with",
         [this] { return _position.load(); }, [this](const std::int64_t& unit) { _jump = unit; },
         number);
+    const auto seconds = Orv::DevMDPropertyDescriptor<double>::create();
+    seconds->setUnit("s");
+    addProperty<double>(
+        "duration", "of all of it, as far as that is known beforehand; else 0",
+        [this] { return _duration; }, nullptr, seconds);
     addProperty<std::int64_t>("video:shown", "pictures that were handed on",
                               [this] { return _nbShown.load(); });
     addProperty<std::int64_t>("video:dropped", "pictures that came too late to be handed on",

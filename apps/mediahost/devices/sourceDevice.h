@@ -24,6 +24,7 @@ protected:
     // In the constructor, each at most once:
     void addPictures(std::unique_ptr<UnitDecoder> decoder, const PictureFormat& format);
     void addSound(std::unique_ptr<UnitDecoder> decoder, const SoundFormat& format);
+    void setDuration(double seconds) { _duration = seconds; }
 
     void start(const Orv::DevMDSyncSeqSignals& signals) override;
     void stop(Orv::DevMDSyncSeqRequest& request) override;
@@ -36,6 +37,7 @@ private:
 
     std::shared_ptr<const PictureFormat> _pictureFormat;
     std::optional<SoundFormat> _soundFormat;
+    double _duration = 0;  // seconds; 0: unknown
     std::unique_ptr<Track> _pictures, _sound;
     Orv::RCShdPtr<Loop> _pictureLoop, _soundLoop;
     Orv::RCShdPtr<Orv::DevMDStdProperty<std::int64_t>> _positionProperty;
