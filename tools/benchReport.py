@@ -5,7 +5,7 @@ Usage: benchReport.py RESULTS.json [TARGETS.txt]
 
 A benchmark is named "<case>/<library>". A line of the targets is "case, ours, peer, limit" with the
 limit of ours / peer, and a counter such as p99 in a fifth field where that is compared instead of
-the time. "#" begins a comment.
+the time. A peer in another case is written "<case>/<library>". "#" begins a comment.
 """
 
 import json
@@ -54,6 +54,12 @@ def read_targets(path):
         yield case, ours, peer, float(limit), fields[4] if len(fields) == 5 else "time"
 
 
+def find_peer(case, peer):
+    """Case and library of a target's peer."""
+    other, _, library = peer.rpartition("/")
+    return other or case, library
+
+
 def print_medians(medians):
     width = max(len(library) for _, library in medians)
     for case in dict.fromkeys(case for case, _ in medians):
@@ -72,7 +78,7 @@ def print_targets(medians, targets):
     for case, ours, peer, limit, counter in targets:
         what = f"{case}{'' if counter == 'time' else ' ' + counter}: {ours} to {peer}"
         try:
-            ratio = medians[case, ours][counter] / medians[case, peer][counter]
+            ratio = medians[case, ours][counter] / medians[find_peer(case, peer)][counter]
         except KeyError:
             print(f"    {what:<56}      -  <= {limit:.2f}  not measured")
             continue

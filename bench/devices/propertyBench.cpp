@@ -6,6 +6,7 @@
 #include <atomic>
 #include <benchmark/benchmark.h>
 #include <condition_variable>
+#include <cstdio>
 #include <cstdlib>
 #include <deque>
 #include <functional>
@@ -35,14 +36,20 @@ std::atomic<long> nbAllocations{0};
 
 // --- those who are asked ---
 
+/// Names of one length, so that what is compared is not how long they are.
+std::string pathOf(int number) {
+    char path[32];
+    std::snprintf(path, sizeof path, "set%d:p%05d", number % 10, number);
+    return path;
+}
+
 class Device : public DevMDStdDevice {
 public:
     Device(const LiString& name, int nbProperties) : DevMDStdDevice(name) {
         value = addProperty<int>(
             "value", "", [this] { return ++_number; }, [this](int number) { _number = number; });
         for (int i = 1; i < nbProperties; ++i) {
-            const std::string path = "set" + std::to_string(i % 10) + ":p" + std::to_string(i);
-            addProperty<int>(path.c_str(), "", [] { return 0; });
+            addProperty<int>(pathOf(i).c_str(), "", [] { return 0; });
         }
     }
     RCShdPtr<DevMDStdProperty<int>> value;
@@ -264,9 +271,7 @@ void notification(benchmark::State& state) {
 
 void resolve(benchmark::State& state, int nbProperties) {
     Managed managed(nbProperties);
-    const int last = nbProperties - 1;
-    const std::string text = "bench:set" + std::to_string(last % 10) + ":p" + std::to_string(last);
-    const LiString name(text.c_str());
+    const LiString name(("bench:" + pathOf(nbProperties - 1)).c_str());
     managed.acc->getProperty(name);
     for (auto _ : state) benchmark::DoNotOptimize(managed.acc->getProperty(name));
 }

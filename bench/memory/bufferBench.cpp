@@ -31,6 +31,18 @@ MbBuffer newLoaded(const MbBufferSimpleFactory& factory) {
     return buffer;
 }
 
+/// A buffer that is never loaded, and how large its object is; see "touch" for the strategies' part.
+void create(benchmark::State& state) {
+    const MbBufferSimpleFactory factory(newHeap(4, new MbUnloadLRU(4)),
+                                        RCShdPtr<MbProtocol>(new MbProtocol));
+    for (auto _ : state) {
+        const MbBuffer buffer = factory.create("bench", SIZE);
+        benchmark::DoNotOptimize(buffer.isNull());
+    }
+    state.counters["bytesPerBuffer"] = sizeof(MbBufferImp);
+}
+BENCHMARK(create)->Name("create+destroy/MbBuffer");
+
 // ------------------------------------------------------------------ what is loaded already
 
 /// Six times the operation that the cost of a lock is compared with.

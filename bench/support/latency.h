@@ -9,7 +9,7 @@
 namespace Orv {
 
 /// Collects how long single operations took and reports percentiles, in nanoseconds, as the
-/// counters "p50", "p99" and "max" of a benchmark. Used by one thread.
+/// counters "p50", "p99", "p99.9" and "max" of a benchmark. Used by one thread.
 class Latency {
 public:
     using Clock = std::chrono::steady_clock;
@@ -25,6 +25,7 @@ public:
         std::sort(_samples.begin(), _samples.end());
         state.counters["p50"] = _samples[_samples.size() / 2];
         state.counters["p99"] = _samples[_samples.size() * 99 / 100];
+        state.counters["p99.9"] = _samples[_samples.size() * 999 / 1000];
         state.counters["max"] = _samples.back();
     }
 

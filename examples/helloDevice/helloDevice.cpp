@@ -2,6 +2,7 @@
 #include <cstdio>
 #include <orv/base.h>
 #include <orv/resmgt.h>
+#include <stdexcept>
 
 #include "mixer.h"
 
@@ -28,6 +29,14 @@ void useProperties(DevMgr& manager) {
         std::printf("%s\n", error.what());
     }
     //! [errors]
+
+    //! [setAndWait]
+    try {
+        DevMgrPropertyValueUtil<int>::setValueAndWait(*properties, "mixer:scene", 4, 1.0);
+    } catch (const std::out_of_range& error) {  // what the mixer's setter threw
+        std::printf("%s\n", error.what());
+    }
+    //! [setAndWait]
 }
 
 void watchTheMeter(DevMgr& manager) {
@@ -49,6 +58,23 @@ void watchTheMeter(DevMgr& manager) {
     const bool wasHeard = isLoud.timedWait(10);
     streams->disconnect("generator:tone push mixer:input");
     //! [stream]
+
+    //! [ended]
+    LkSema isOver("over", 0);
+    streams->connect("generator:tone push mixer:input",
+                     [&](const DevMgrStreamAcc::Connection& connection) {
+                         if (connection.state == DevMDStream::State::ENDED) isOver.post();
+                     });
+    const bool hasEnded = isOver.timedWait(10);
+    streams->disconnect("generator:tone push mixer:input");
+    //! [ended]
+
+    //! [devices]
+    for (const DevMgr::Device& device : manager.getDevices()) {
+        std::printf("%s has %d requests to go\n", device.name.getChars(), device.nbWaiting);
+    }
+    //! [devices]
+    std::printf("%s\n", hasEnded ? "the tone has ended" : "the tone goes on");
     std::printf("%s\n", wasHeard ? "the tone was heard" : "silence");
 }
 

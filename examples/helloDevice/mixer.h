@@ -1,10 +1,11 @@
-// A device in sixty lines: a mixer with a gain, a peak meter, an input that others push sound into,
+// A device in seventy lines: a mixer with a gain, a peak meter, an input that others push sound into,
 // and an output that pushes a test tone.
 #pragma once
 
 #include <algorithm>
 #include <cmath>
 #include <orv/devMDStdDevice.h>
+#include <stdexcept>
 #include <vector>
 
 /// A block of samples that travels through streams.
@@ -28,6 +29,13 @@ public:
             [this](double gain) { _gain = gain; }, decibels);
         _meter = addProperty<double>("meter:peak", "loudest sample", [this] { return _peak; });
 
+        addProperty<int>(
+            "scene", "recalled last", [this] { return _scene; },
+            [this](int scene) {
+                if (scene > 3) throw std::out_of_range("there are three scenes");
+                _scene = scene;
+            });
+
         addSink("input", "audio/pcm", [this](Orv::ObjPtr<Orv::DevMDStreamElem> elem) {
             if (elem->getEv() == Orv::DevMDStreamElem::DATA) measure(*elem);
         });
@@ -37,6 +45,7 @@ public:
 private:
     double _gain = 0;
     double _peak = 0;
+    int _scene = 1;
     Orv::RCShdPtr<Orv::DevMDStdProperty<double>> _meter;
 
     void open() override { _peak = 0; }  // on the mixer's thread; what it throws, opening throws

@@ -6,6 +6,7 @@
 #include "eventually.h"
 #include "expectThrows.h"
 #include "kitTesting.h"
+#include "lgCollectingSink.h"
 #include "rcEx.h"
 
 namespace Orv {
@@ -24,6 +25,19 @@ struct OpenDevice {
         value = device->addProperty<int>("value", "", std::move(getter), std::move(setter));
         device->performOpen();
     }
+};
+
+/// A request that holds the device up.
+class HoldANO : public DevANO {
+public:
+    HoldANO(Gate& hold, Gate& holding) : _hold(hold), _holding(holding) {}
+    void performExecute() override {
+        _holding.open();
+        _hold.wait();
+    }
+
+private:
+    Gate &_hold, &_holding;
 };
 
 TEST(DevMDStdAccessPrtcl, runsEverythingOnOneThreadOfItsOwn) {
@@ -45,6 +59,20 @@ TEST(DevMDStdAccessPrtcl, runsEverythingOnOneThreadOfItsOwn) {
     device->performClose();  // does nothing
     EXPECT_EQ(ids.size(), 3U);
     expectAsserts("!isOpen()", [&] { device->performOpen(); });
+}
+
+TEST(DevMDStdDevice, mayLearnOfItsPropertiesAndStreamsWhileItOpens) {
+    const RCShdPtr<TestDevice> device(new TestDevice);
+    device->addProperty<int>("set:first", "", [] { return 1; });
+    device->onOpen = [&] {
+        device->addProperty<int>("set:second", "", [] { return 2; });
+        device->addPassiveSource("video", "");
+    };
+    device->performOpen();
+    EXPECT_EQ(device->performGetStreams().getCardinality(), 1U);
+    const auto sets = device->getPropertySetIter();
+    ASSERT_EQ(sets.getCardinality(), 1U);
+    EXPECT_EQ(sets.item()->getPropertyIter().getCardinality(), 2U);
 }
 
 TEST(DevMDStdAccessPrtcl, anOpeningThatThrowsLeavesItClosed) {
@@ -168,17 +196,6 @@ TEST(DevMDStdProperty, theEndOfTheDeviceEndsEveryWaitForIt) {
         device->performOpen();
         Gate holds;
         Gate isHolding;
-        class HoldANO : public DevANO {
-        public:
-            HoldANO(Gate& hold, Gate& holding) : _hold(hold), _holding(holding) {}
-            void performExecute() override {
-                _holding.open();
-                _hold.wait();
-            }
-
-        private:
-            Gate &_hold, &_holding;
-        };
         device->fifo->produce(DevANOQueueEntry(ObjPtr<DevANO>(new HoldANO(holds, isHolding))));
         isHolding.wait();
         // Four find room in the queue, the others wait for it.
@@ -209,6 +226,88 @@ TEST(DevMDStdProperty, theEndOfTheDeviceEndsEveryWaitForIt) {
         EXPECT_THROW(device->value->set(1), DevPrtclEx::ExMDStdFifoClosed);
         device->performClose();  // without a handshake that nobody would answer
     }
+}
+
+constexpr const char* NOT_SET = "Error while setting the value for value";
+
+TEST(DevMDStdProperty, setAndWaitReturnsWhenTheDeviceHasTakenTheValueOrRefusedIt) {
+    int taken = 0;
+    OpenDevice open([&] { return taken; },
+                    [&](int value) {
+                        if (value < 0) throw std::range_error("too low");
+                        if (value == 0) throw 42;
+                        taken = value;
+                    });
+    for (const bool isTimed : {false, true}) {
+        const auto set = [&](int value) {
+            isTimed ? open.value->setAndWait(value, 1000) : open.value->setAndWait(value);
+        };
+        open.value->set(-1);  // traced, and nobody else's business
+        open.value->set(1);
+        set(2);
+        EXPECT_EQ(taken, 2) << "after those before it, and done";
+        expectThrows<std::range_error>("too low", [&] { set(-1); });
+        EXPECT_THROW(set(0), int);
+        EXPECT_EQ(taken, 2);
+    }
+    open.device->performClose();
+    expectThrows<DevPrtclEx::ExMDStdFifoClosed>(CLOSED, [&] { open.value->setAndWait(3); });
+    OpenDevice readOnly([] { return 0; });
+    EXPECT_THROW(readOnly.value->setAndWait(1), DevPrtclEx::ExMDPropertyIllegalOp);
+}
+
+TEST(DevMDStdProperty, setAndWaitEndsWithTheTimeTheDeviceAndInCircles) {
+    Gate holds;
+    TestCounter nbTaken;
+    OpenDevice open([] { return 0; },
+                    [&](int value) {
+                        holds.wait();
+                        nbTaken.add();
+                        if (value == 2) throw Death();  // after its sender has given up
+                    });
+    expectThrows<DevPrtclEx::ExMDStdPropertySet>(NOT_SET, [&] { open.value->setAndWait(2, 0.02); });
+    holds.open();
+    open.value->setAndWait(1);
+    EXPECT_EQ(nbTaken.get(), 2);
+
+    Gate isOver;
+    open.device->post([&] {
+        expectThrows<DevPrtclEx::ExMDStdPropertySet>(NOT_SET, [&] { open.value->setAndWait(3); });
+        isOver.open();
+    });
+    isOver.wait();
+
+    const RCShdPtr<MortalDevice> mortal(new MortalDevice("mortal"));
+    mortal->performOpen();
+    Gate goesOn, isHeld;
+    mortal->fifo->produce(DevANOQueueEntry(ObjPtr<DevANO>(new HoldANO(goesOn, isHeld))));
+    isHeld.wait();
+    std::thread setter([&] {
+        expectThrows<DevPrtclEx::ExMDStdPropertySet>(NOT_SET,
+                                                     [&] { mortal->value->setAndWait(1); });
+    });
+    eventually("the set is in the queue", [&] { return mortal->fifo->getSize() == 1; });
+    mortal->die();
+    goesOn.open();
+    setter.join();
+}
+
+class DevMDStdDeviceLog : public LgLogTest {};
+
+TEST_F(DevMDStdDeviceLog, tellsOnceAndAtOnceWhatADeviceHasDiedOf) {
+    addSink();
+    const RCShdPtr<MortalDevice> device(new MortalDevice("mortal"));
+    device->performOpen();
+    device->die();
+    device->value->set(1);
+    eventually("the device has died", [&] { return device->fifo->isClosed(); });
+    registry.flush();
+    EXPECT_EQ(sink->takeTexts(),
+              std::vector<std::string>{"Error while running the device \"mortal\", which has "
+                                       "died: the device has died"});
+    device->performClose();
+    registry.flush();
+    EXPECT_TRUE(sink->takeTexts().empty());
 }
 
 TEST(DevMDStdProperty, devicesThatGetFromEachOtherAreToldInsteadOfWaitingForEver) {

@@ -135,6 +135,40 @@ TEST_F(DevMDStdSyncSeq, whatTheBaseClassDoesIsEnoughForADeviceWithNothingToDo) {
     plain->performClose();
 }
 
+TEST_F(DevMDStdSyncSeq, canStopWhenItsInputsHaveEnded) {
+    class Recorder : public DevMDStdSyncSeqDevice {
+    public:
+        Recorder() : DevMDStdSyncSeqDevice("recorder") {
+            input = addSink("input", "", [](const ObjPtr<DevMDStreamElem>&) {});
+        }
+        RCShdPtr<DevMDStdStreamPassiveSink> input;
+        TestCounter nbStops, nbFinished;
+
+    protected:
+        void inputsEnded() override { nbFinished.add(); }
+        void stop(DevMDSyncSeqRequest& request) override {
+            stopWhenInputsEnd(request);
+            nbStops.add();
+        }
+    };
+    const RCShdPtr<Recorder> recorder(new Recorder);
+    recorder->performOpen();
+    recorder->performStop(countIn(outcome));
+    EXPECT_TRUE(outcome.run.waitFor(1)) << "nothing is on its way";
+    recorder->input->start();
+    recorder->performStop(countIn(outcome));
+    recorder->nbStops.waitFor(2);
+    EXPECT_EQ(outcome.run.get(), 1);
+    recorder->input->stop();
+    EXPECT_TRUE(outcome.run.waitFor(2));
+    EXPECT_EQ(recorder->nbFinished.get(), 1) << "before the stop is done";
+    recorder->input->start();
+    recorder->performStop(countIn(outcome));
+    recorder->nbStops.waitFor(3);
+    recorder->performClose();
+    EXPECT_EQ(outcome.dropped.get(), 1) << "it would lead back to the device";
+}
+
 TEST_F(DevMDStdSyncSeq, goesOnToOtherRequestsWhileOneIsPostponed) {
     DevMDSyncSeqDone done;
     Outcome later;

@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <gtest/gtest.h>
+#include <string>
 #include <thread>
 #include <vector>
 
@@ -7,6 +8,8 @@
 #include "eventually.h"
 #include "expectThrows.h"
 #include "kitTesting.h"
+#include "mtThread.h"
+#include "mtThreadMgr.h"
 #include "rcEx.h"
 
 namespace Orv {
@@ -114,10 +117,9 @@ TEST(DevMDStdStreamPassiveSink, theDeviceSeesWhatIsPushedAndOneTerminalElementLa
     end.sink->start();
     EXPECT_THROW(end.sink->push(numberElem(5)), DevPrtclEx::ExMDStdFifoClosed);
     end.sink->stop();
-    ObjPtr<DevMDStdStreamPassiveSinkANOFactory> factory(
-        new DevMDStdFunctionSinkFactory([](const ObjPtr<Elem>&) {}));
-    DevMDStdStreamPassiveSink loose("loose", "", nullptr, std::move(factory));
-    EXPECT_THROW(loose.push(numberElem(1)), RCEx::ExNullPtr);
+    const RCShdPtr<DevMDStdStreamFunctionSink> loose(
+        new DevMDStdStreamFunctionSink("loose", "", nullptr, [](const ObjPtr<Elem>&) {}));
+    EXPECT_THROW(loose->push(numberElem(1)), RCEx::ExNullPtr);
 }
 
 TEST(DevMDStdStreamPassiveSink, aFullQueueKeepsStopFromWaiting) {
@@ -136,6 +138,169 @@ TEST(DevMDStdStreamPassiveSink, aFullQueueKeepsStopFromWaiting) {
     holds.open();
     end.device->performClose();
     EXPECT_EQ(end.seen, (std::vector<int>{1, -Elem::STOPPED}));
+}
+
+std::string textOf(const std::exception_ptr& failure) {
+    try {
+        if (failure) std::rethrow_exception(failure);
+        return "";
+    } catch (const std::exception& exception) {
+        return exception.what();
+    }
+}
+
+TEST(DevMDStdStreamFunctionSink, whatItsFunctionThrowsEndsTheStreamAndIsTold) {
+    const RCShdPtr<TestDevice> device(new TestDevice);
+    std::vector<int> seen;  // of the device's thread, until it is closed
+    Gate hasThrown;
+    const auto sink = device->addSink("input", "", [&](const ObjPtr<Elem>& elem) {
+        seen.push_back(codeOf(*elem));
+        if (seen.back() == 2) {
+            hasThrown.open();
+            throw std::runtime_error("the disk is full");
+        }
+    });
+    device->performOpen();
+    DevMDStdStreamActiveSource source("video", "");
+    for (int round = 0; round < 2; ++round) {  // the second time as if nothing had been
+        source.connect(sink);
+        sink->start();
+        source.start();
+        EXPECT_TRUE(source.push(numberElem(1)));
+        EXPECT_TRUE(source.push(numberElem(2)));
+        hasThrown.wait();
+        eventually("the sink has failed", [&] { return sink->getState() == State::FAILED; });
+        expectThrows<std::runtime_error>("the disk is full", [&] { sink->push(numberElem(3)); });
+        EXPECT_EQ(source.getState(), State::RUNNING);
+        EXPECT_FALSE(source.push(numberElem(4)));
+        EXPECT_EQ(source.getState(), State::FAILED);
+        EXPECT_EQ(textOf(source.getFailure()), "the disk is full");
+        EXPECT_EQ(textOf(sink->getFailure()), "the disk is full");
+        source.stop();
+        source.disconnect();
+        sink->stop();
+        EXPECT_EQ(sink->getState(), State::FREE);
+    }
+    device->performClose();
+    EXPECT_EQ(seen, (std::vector<int>{1, 2, -Elem::STOPPED, 1, 2, -Elem::STOPPED}));
+}
+
+TEST(DevMDStdStreamFunctionSink, whatIsLeftOfAStreamDoesNotHarmTheNext) {
+    const RCShdPtr<TestDevice> device(new TestDevice);
+    std::vector<int> seen;
+    const auto sink = device->addSink("input", "", [&](const ObjPtr<Elem>& elem) {
+        seen.push_back(codeOf(*elem));
+        if (seen.back() == 1) throw Death();
+    });
+    device->performOpen();
+    Gate holds;
+    device->post([&] { holds.wait(); });
+    sink->start();
+    for (const int number : {1, 2}) sink->push(numberElem(number));
+    sink->stop();
+    sink->start();
+    holds.open();
+    sink->push(numberElem(3));
+    device->post([] {});
+    eventually("the device has seen all", [&] { return device->getFifo()->getSize() == 0; });
+    EXPECT_EQ(sink->getState(), State::RUNNING);
+    sink->push(numberElem(4));
+    sink->stop();
+    device->performClose();
+    EXPECT_EQ(seen, (std::vector<int>{1, -Elem::STOPPED, 3, 4, -Elem::STOPPED}));
+}
+
+TEST(DevMDStdDevice, tellsWhenItsLastOpenInputHasEnded) {
+    class Recorder : public TestDevice {
+    public:
+        using DevMDStdDevice::hasOpenInputs;
+        std::string journal;
+        TestCounter nbAll;
+        void inputsEnded() override {
+            journal += "all;";
+            nbAll.add();
+        }
+    };
+    const RCShdPtr<Recorder> device(new Recorder);
+    RCShdPtr<DevMDStdStreamPassiveSink> sinks[3];
+    for (auto& sink : sinks) {
+        sink = device->addSink("input", "audio/pcm", [&](const ObjPtr<Elem>& elem) {
+            device->journal += std::to_string(codeOf(*elem)) + ';';
+            if (codeOf(*elem) == 7) throw Death();  // ends all the same
+        });
+    }
+    const auto odd = device->addSink(
+        "odd", "", [](const ObjPtr<Elem>&) {},
+        [](const LiString& description) { return description == "odd"; });
+    EXPECT_TRUE(odd->isCompatible("odd"));
+    EXPECT_FALSE(odd->isCompatible("audio/pcm"));
+    EXPECT_FALSE(sinks[0]->isCompatible("odd"));
+    device->performOpen();
+    EXPECT_FALSE(device->hasOpenInputs());
+    sinks[0]->start();
+    sinks[1]->start();  // the third is not in use
+    EXPECT_TRUE(device->hasOpenInputs());
+    sinks[0]->push(numberElem(7));
+    sinks[1]->push(numberElem(5));
+    sinks[0]->stop();
+    sinks[1]->push(newsElem(Elem::END));
+    device->nbAll.waitFor(1);
+    EXPECT_FALSE(device->hasOpenInputs());
+    sinks[1]->stop();
+    sinks[2]->start();
+    sinks[2]->stop();
+    device->performClose();
+    EXPECT_EQ(device->journal, "7;5;-4;-2;all;-4;all;");
+}
+
+TEST(DevMDStdStreamLoopSource, preparesOnItsOwnThreadBeforeItStarts) {
+    SinkDevice end;
+    constexpr unsigned stackSize = 3U << 20;
+    std::thread::id preparing;
+    int nbTries = 0;
+    const RCShdPtr<DevMDStdStreamLoopSource> source(new DevMDStdStreamLoopSource(
+        "video", "",
+        [&](DevMDStdStreamLoopSource& self) {
+            EXPECT_EQ(preparing, std::this_thread::get_id());
+            EXPECT_EQ(MtThreadMgr::findCurrentThread()->getStackSize(), stackSize);
+            self.push(numberElem(1));
+        },
+        [&](DevMDStdStreamLoopSource&) {
+            preparing = std::this_thread::get_id();
+            if (++nbTries == 1) throw std::runtime_error("no such file");
+        },
+        stackSize));
+    source->connect(end.sink);
+    end.sink->start();
+    expectThrows<std::runtime_error>("no such file", [&] { source->start(); });
+    EXPECT_TRUE(source->isAvailable());
+    source->start();
+    EXPECT_EQ(nbTries, 2) << "done when it has started";
+    EXPECT_NE(preparing, std::this_thread::get_id());
+    end.nbSeen.waitFor(2);
+    source->stop();
+    source->disconnect();
+    end.sink->stop();
+    end.device->performClose();
+    EXPECT_EQ(end.seen, (std::vector<int>{1, -Elem::END}));
+}
+
+TEST(DevMDStdStreamLoopSource, aPreparationThatAsksTheDeviceThatWaitsForItFails) {
+    const RCShdPtr<TestDevice> device(new TestDevice);
+    const auto value = device->addProperty<int>("value", "", [] { return 1; });
+    device->performOpen();
+    const RCShdPtr<DevMDStdStreamLoopSource> source(new DevMDStdStreamLoopSource(
+        "video", "", [](DevMDStdStreamLoopSource&) {},
+        [&](DevMDStdStreamLoopSource&) {
+            int got = 0;
+            value->get(got);
+        }));
+    Gate isOver;
+    device->post([&] {
+        EXPECT_THROW(source->start(), DevPrtclEx::ExMDStdPropertyGet);
+        isOver.open();
+    });
+    EXPECT_TRUE(isOver.wait());
 }
 
 TEST(DevMDStdStreamLoopSource, pushesUntilItsFunctionReturnsAndThenEnds) {
@@ -222,6 +387,7 @@ TEST(DevMDStdStreamLoopSource, aLoopThatThrowsAndASinkThatDiesAreFailures) {
     throwing->start();
     end.nbSeen.waitFor(1);
     eventually("it has failed", [&] { return throwing->getState() == State::FAILED; });
+    EXPECT_EQ(textOf(throwing->getFailure()), "the device has died");
     throwing->stop();
     throwing->disconnect();
     end.sink->stop();

@@ -17,6 +17,11 @@ struct UnnamedSema : LkUnnamedSema {
     explicit UnnamedSema(unsigned count = 0) : LkUnnamedSema("test", count) {}
 };
 
+struct SleepingSema : LkUnnamedSema {
+    explicit SleepingSema(unsigned count = 0) : LkUnnamedSema("test", count) {}
+    void wait() { waitAsleep(); }
+};
+
 struct MutexSema : LkSema {
     explicit MutexSema(unsigned count = 0)
         : LkSema("test", count, LkMutexAttr::getDefaultAttr(), LkCondVarAttr::getDefaultAttr()) {}
@@ -30,7 +35,7 @@ struct NamelessSema : LkNamedSema {
 template <class Sema>
 class LkSemas : public testing::Test {};
 
-using Semas = testing::Types<UnnamedSema, MutexSema, NamelessSema>;
+using Semas = testing::Types<UnnamedSema, SleepingSema, MutexSema, NamelessSema>;
 TYPED_TEST_SUITE(LkSemas, Semas);
 
 TYPED_TEST(LkSemas, letsThroughAsManyAsWereCountedAndNoMore) {
@@ -91,6 +96,7 @@ TEST(LkUnnamedSema, withTooHighACountIsInvalidAndAsserts) {
     EXPECT_EQ(sema.getErrno(), LkSemaTypes::getCountError());
     expectAsserts("isValid()", [&] { sema.post(); });
     expectAsserts("isValid()", [&] { sema.wait(); });
+    expectAsserts("isValid()", [&] { sema.waitAsleep(); });
     expectAsserts("result == WAIT_TIMEOUT", [&] { static_cast<void>(sema.tryWait()); });
     expectAsserts("initialCount <= LkWaitQueue::HIGHEST_COUNT",
                   [] { LkSema tooHigh("test", 0xFFFFFFFFU); });

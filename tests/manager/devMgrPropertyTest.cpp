@@ -55,6 +55,11 @@ TEST(DevMgrPropertyAcc, findsPropertiesAndSaysWhatIsWrong) {
                              "mixer:eq:gain:more", "mixer:::gain"}) {
         expectThrows<DevMgrEx::NameNotRegistered>(notRegistered, [&] { acc.getProperty(name); });
     }
+    EXPECT_EQ(subjectOf<DevMgrEx::NameNotRegistered>([&] { acc.getProperty("mixer: eq:pan"); }),
+              "mixer:eq:pan");
+    EXPECT_EQ(subjectOf<DevMgrEx::BadMDPrtclImp>([&] { acc.getProperty("plain:gain"); }), "plain");
+    EXPECT_EQ(subjectOf<DevPrtclEx::ExNameNotRegistered>([&] { acc.getProperty("unknown:gain"); }),
+              "unknown");
     expectThrows<DevMgrEx::BadMDPrtclImp>("Managed device protocol not implemented.",
                                           [&] { acc.getProperty("plain:gain"); });
     EXPECT_THROW(acc.getProperty("unknown:gain"), DevPrtclEx::ExNameNotRegistered);
@@ -68,6 +73,9 @@ TEST(DevMgrPropertyAcc, findsPropertiesAndSaysWhatIsWrong) {
     int value = 0;
     DevMgrPropertyValueUtil<int>::getValue(acc, "mixer:eq:gain", value, 1000);
     EXPECT_EQ(value, 7);
+    DevMgrPropertyValueUtil<int>::setValueAndWait(acc, "mixer:eq:gain", 8);
+    DevMgrPropertyValueUtil<int>::setValueAndWait(acc, "mixer:eq:gain", 9, 1000);
+    EXPECT_EQ(mixer.gain, 9);
     EXPECT_THROW(acc.attachObserver(nullptr, observer([](const Hint&) {})), RCEx::ExNullPtr);
     EXPECT_THROW(Util::attachObserver(acc, "mixer:eq:gain", nullptr), RCEx::ExNullPtr);
 }

@@ -1,5 +1,7 @@
+#include <exception>
 #include <gtest/gtest.h>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "devMgrEx.h"
@@ -108,6 +110,128 @@ TEST(DevMgrStreamAcc, tellsHowConnectionsFare) {
     studio.acc->connect("camera:video push display:other");
 }
 
+/// What a listener was told, one state after the other.
+struct Told {
+    std::vector<std::pair<State, std::exception_ptr>> states;  // of the manager's thread
+    TestCounter nb;
+    DevMgrStreamAcc::Ended listener() {
+        return [this](const DevMgrStreamAcc::Connection& connection) {
+            states.emplace_back(connection.state, connection.failure);
+            nb.add();
+        };
+    }
+};
+
+TEST(DevMgrStreamAcc, tellsWhenAConnectionEndsByItself) {
+    Studio studio;
+    DevMgrStreamAcc& acc = *studio.acc;
+    Told told;
+    constexpr const char* string = "camera:video push display:input";
+    for (int round = 1; round <= 3; ++round) {
+        studio.nbLeft = 5;
+        acc.connect(string, told.listener());
+        told.nb.waitFor(round);
+        acc.disconnect(string);
+    }
+    studio.nbLeft = 1000000;
+    const int nbShown = studio.nbShown.get();
+    acc.connect(string, told.listener());
+    studio.nbShown.waitFor(nbShown + 10);
+    acc.disconnect(string);  // no news to who does it
+    studio.acc.reset();
+    studio.mgr.reset();  // delivers what is in its queue
+    ASSERT_EQ(told.states.size(), 3U);
+    for (const auto& [state, failure] : told.states) {
+        EXPECT_EQ(state, State::ENDED);
+        EXPECT_FALSE(failure);
+    }
+}
+
+TEST(DevMgrStreamAcc, tellsWhatAConnectionFailedWith) {
+    Studio studio;
+    DevMgrStreamAcc& acc = *studio.acc;
+    const Registered broken("broken", [](TestDevice& device) {
+        device.addSink("input", "", [](const ObjPtr<Elem>& elem) {
+            if (!elem->isTerminal()) throw Death();
+        });
+        device.addSink("late", "", [](const ObjPtr<Elem>& elem) {
+            if (elem->isTerminal()) throw Death();
+        });
+        device.addLoopSource("video", "video/raw",
+                             [](DevMDStdStreamLoopSource&) { throw Death(); });
+        device.addLoopSource(
+            "closed", "video/raw", [](DevMDStdStreamLoopSource&) {},
+            [](DevMDStdStreamLoopSource&) { throw Death(); });
+    });
+    for (const char* const string :
+         {"camera:video push broken:input", "broken:video push display:input"}) {
+        Told told;
+        acc.connect(string, told.listener());
+        told.nb.waitFor(1);
+        ASSERT_EQ(acc.getConnections().size(), 1U);
+        EXPECT_EQ(acc.getConnections()[0].state, State::FAILED) << string;
+        ASSERT_TRUE(acc.getConnections()[0].failure) << string;
+        EXPECT_THROW(std::rethrow_exception(acc.getConnections()[0].failure), Death);
+        acc.disconnect(string);
+        ASSERT_EQ(told.states.size(), 1U) << string;
+        EXPECT_EQ(told.states[0].first, State::FAILED);
+    }
+    {
+        // The source is through before its sink fails at what came last, or hears of it first.
+        Told told;
+        studio.nbLeft = 1;
+        acc.connect("camera:video push broken:late", told.listener());
+        eventually("the sink has failed",
+                   [&] { return acc.getConnections()[0].state == State::FAILED; });
+        told.nb.waitFor(1);
+        acc.disconnect("camera:video push broken:late");
+    }
+    Told told;
+    expectThrows<Death>("the device has died",
+                        [&] { acc.connect("broken:closed push display:input", told.listener()); });
+    EXPECT_TRUE(acc.getConnections().empty());
+    EXPECT_TRUE(told.states.empty());
+}
+
+TEST(DevMgrStreamAcc, whoHearsOfAnEndMayDisconnectAndConnectAnew) {
+    Studio studio;
+    DevMgrStreamAcc& acc = *studio.acc;
+    constexpr const char* string = "camera:video push display:input";
+    TestCounter nbTold;
+    DevMgrStreamAcc::Ended restart = [&](const DevMgrStreamAcc::Connection& connection) {
+        acc.disconnect(connection.configString);
+        studio.nbLeft = 3;
+        if (nbTold.get() < 10) acc.connect(connection.configString, restart);
+        nbTold.add();
+        throw Death();  // nobody else's business
+    };
+    studio.nbLeft = 3;
+    acc.connect(string, restart);
+    nbTold.waitFor(11);
+    studio.nbEnded.waitFor(11);
+    EXPECT_EQ(studio.nbShown.get(), 33);
+    EXPECT_TRUE(acc.getConnections().empty());
+}
+
+TEST(DevMgrStreamAcc, disconnectingWaitsForWhoIsJustHearingOfTheEnd) {
+    Studio studio;
+    Gate isHearing, goesOn, isDisconnected;
+    studio.nbLeft = 1;
+    studio.acc->connect("camera:video push display:input", [&](const DevMgrStreamAcc::Connection&) {
+        isHearing.open();
+        goesOn.wait();
+        EXPECT_FALSE(isDisconnected.isOpen());
+    });
+    isHearing.wait();
+    std::thread disconnecting([&] {
+        studio.acc->disconnect("camera:video push display:input");
+        isDisconnected.open();
+    });
+    eventually("the connection has gone", [&] { return studio.acc->getConnections().empty(); });
+    goesOn.open();
+    disconnecting.join();
+}
+
 TEST(DevMgrStreamAcc, letsASinkPullFromTheApplicationsOwnEnd) {
     Studio studio;
     DevMgrStreamAcc& acc = *studio.acc;
@@ -151,6 +275,9 @@ TEST(DevMgrStreamAcc, refusesWhatDoesNotFitAndLeavesTheEndsAlone) {
                                 "camera:video push display:none", "camera:video push :input"}) {
         EXPECT_THROW(acc.connect(unknown), DevMgrEx::NameNotRegistered) << unknown;
     }
+    EXPECT_EQ(subjectOf<DevMgrEx::NameNotRegistered>(
+                  [&] { acc.connect("camera:video push display:none"); }),
+              "display:none");
     EXPECT_THROW(acc.connect("unknown:video push display:input"), DevPrtclEx::ExNameNotRegistered);
     EXPECT_THROW(acc.connect("camera:video copy display:input"), DevMgrEx::ConfigSyntaxError);
     EXPECT_THROW(acc.disconnect("camera"), DevMgrEx::ConfigSyntaxError);

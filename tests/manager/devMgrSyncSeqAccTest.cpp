@@ -270,6 +270,9 @@ TEST_F(DevMgrSyncSeqAccTest, abortsAllOthersWhenADeviceThrows) {
         for (const std::string& name : NAMES) EXPECT_TRUE(eventuallyIn(name.c_str(), "final"));
         expectFailure("lock");
         EXPECT_EQ(acc->getFailure("deckB"), failure);
+        EXPECT_EQ(subjectOf<DevMgrEx::SMExecutionError>(
+                      [&] { static_cast<void>(acc->waitFor("lock", 1000)); }),
+                  "deckB");
         EXPECT_TRUE(acc->getFailure("clock").isEmpty());
         expectThrows<DevMgrEx::SMExecutionError>("State machine error condition.",
                                                  [&] { acc->start(); });

@@ -50,6 +50,8 @@ TEST(DevRegistry, keepsEntriesByNameInOrder) {
         EXPECT_EQ(nbCreated, 1);
     }
     expectThrows<DevPrtclEx::ExNameNotRegistered>(UNKNOWN, [&] { registry.removeEntry("ant"); });
+    EXPECT_EQ(subjectOf<DevPrtclEx::ExNameNotRegistered>([&] { registry.removeEntry("ant"); }),
+              "ant");
     expectThrows<DevPrtclEx::ExNameNotRegistered>(UNKNOWN,
                                                   [&] { registry.getEntryDescription("zebra"); });
     EXPECT_THROW(registry.createPrtcl(""), DevPrtclEx::ExNameNotRegistered);
@@ -76,6 +78,40 @@ TEST(DevMgr, makesAndOpensADeviceOnceForEachManager) {
         }
     }
     EXPECT_EQ(nbClosed.get(), 2);
+}
+
+TEST(DevMgr, showsItsDevicesAndHowLongTheirQueuesAre) {
+    Gate holds, isOpening, opens;
+    RCShdPtr<TestDevice> busy;
+    const Registered registered("busy", [&] { return RCShdPtr<DevMDPrtcl>(busy); }, 0);
+    const Registered slow("slow", [&](TestDevice& device) {
+        device.onOpen = [&] {
+            isOpening.open();
+            opens.wait();
+        };
+    });
+    class Plain : public DevMDPrtcl {};
+    const Registered plain("plain", [] { return RCShdPtr<DevMDPrtcl>(new Plain); }, 0);
+    busy = RCShdPtr<TestDevice>(new TestDevice("busy"));
+    const ObjPtr<DevMgr> mgr = DevMgr::create();
+    EXPECT_TRUE(mgr->getDevices().empty());
+    mgr->getPrtcl("plain");
+    mgr->getPrtcl("busy");
+    busy->post([&] { holds.wait(); });
+    eventually("the device is busy", [&] { return mgr->getDevices()[1].nbWaiting == 0; });
+    for (int i = 0; i < 3; ++i) busy->post([] {});
+    std::thread opener([&] { mgr->getPrtcl("slow"); });
+    isOpening.wait();
+    std::string text;
+    for (const DevMgr::Device& device : mgr->getDevices()) {
+        text += std::string(device.name.getText()) + (device.isOpen ? " open " : " opening ") +
+                std::to_string(device.nbWaiting) + "; ";
+    }
+    EXPECT_EQ(text, "plain open 0; busy open 3; slow opening 0; ");
+    EXPECT_EQ(mgr->getNbNotifications(), 0);
+    opens.open();
+    holds.open();
+    opener.join();
 }
 
 TEST(DevMgr, givesEveryNamedDeviceThatIsRegistered) {

@@ -39,6 +39,17 @@ private:
     const LiString _name;
 };
 
+/// What the exception of @p action says that it is about.
+template <class Ex, class Action>
+LiString subjectOf(Action action) {
+    try {
+        action();
+    } catch (const Ex& exception) {
+        return exception.getSubject();
+    }
+    return "nothing was thrown";
+}
+
 template <class T>
 T getValue(DevMgrPropertyAcc& acc, const char* property) {
     T value{};

@@ -41,6 +41,7 @@ constexpr const char* NO_TEXT = nullptr;
 TEST(DevMgrEx, reasonsAreTheTextsThatProgramsLookFor) {
     checkMgr<DevMgrEx::NameNotUnique>("Not a unique name.");
     checkMgr<DevMgrEx::NameNotRegistered>("Not a registered object.");
+    checkMgr<DevMgrEx::NameNotRegistered>("Not a registered object.", "mixer:gain");
     checkMgr<DevMgrEx::NameNotFound>("Named device not found.");
     checkMgr<DevMgrEx::ConfigSyntaxError>("a : [ 100% ]", "a : [ 100% ]");
     checkMgr<DevMgrEx::ConfigSyntaxError>("Configuration string Syntax error.", NO_TEXT);
@@ -77,6 +78,7 @@ TEST(DevPrtclEx, reasonsAreTheTextsThatProgramsLookFor) {
                                                "50% gain");
     checkPrtcl<DevPrtclEx::ExMDStdPropertyGet>("Error while getting the value for <unknown>",
                                                NO_TEXT);
+    checkPrtcl<DevPrtclEx::ExMDStdPropertySet>("Error while setting the value for gain", "gain");
     checkPrtcl<DevPrtclEx::ExMDStdPropertySetBuilderPop>(
         "Trying to pop the builder's property stack when it is empty.");
     checkPrtcl<DevPrtclEx::ExMDStdFifoClosed>("Device request queue is closed.");

@@ -46,6 +46,13 @@ class BenchReportTest(unittest.TestCase):
         self.assertRegex(text, r"wake: ours to peer +0\.50 .* met")
         self.assertRegex(text, r"wake p99: ours to peer +3\.00 .* MISSED")
 
+    def test_compares_with_another_case(self):
+        _, text = self.report(
+            [run_of("lock/ours/threads:1", 10, 10), run_of("lock/peer/threads:1", 1, 1),
+             run_of("lock/ours/threads:2", 6, 1, threads=2)],
+            "lock threads:2, ours, lock/ours, 0.59\n")
+        self.assertRegex(text, r"lock threads:2: ours to lock/ours +0\.60 .* MISSED")
+
     def test_refuses_a_line_it_cannot_read_and_an_empty_run(self):
         self.assertEqual(self.report([run_of("copy/ours", 1, 1)], "copy, ours\n")[0], 1)
         self.assertEqual(self.report([], "")[0], 1)

@@ -21,9 +21,6 @@ std::string toText(const TextValue& value);
 ///
 /// - Threads: all functions of a device run on its own.
 class MediaDevice : public Orv::DevMDStdSyncSeqDevice {
-public:
-    int getQueueLength() const { return getFifo()->getSize(); }  ///< Any thread.
-
 protected:
     using Elem = Orv::DevMDStreamElem;
     using Source = Orv::DevMDStdStreamActiveSource;

@@ -2,13 +2,14 @@
 
 #include "devMDPropertyAny.h"
 #include "devMDValue.h"
+#include "lkTimeLimit.h"
 
 namespace Orv {
 
 /// A property whose value is a @p T; a property is seen as exactly the type it has.
 ///
-/// - Threads: any. get() on the device's own thread, or in a circle of devices that get from each
-///   other, throws at once instead of waiting for ever.
+/// - Threads: any. Waiting for an answer on the device's own thread, or in a circle of devices that
+///   ask each other, throws at once instead of waiting for ever.
 /// - Errors: DevPrtclEx::ExMDPropertyIllegalOp if the attributes do not allow the operation,
 ///   DevPrtclEx::ExMDStdFifoClosed if the device is closed or dead.
 template <DevMDValue T>
@@ -27,12 +28,28 @@ public:
     /// @throws DevPrtclEx::ExMDPropertyOutOfRange before anything is asked.
     void set(const T& value);
 
+    /// Like set(), but returns when the device has taken the value.
+    /// @throws what the device throws at the value; DevPrtclEx::ExMDStdPropertySet if it goes
+    ///   without having taken it.
+    void setAndWait(const T& value);
+
+    /// Gives up after @p seconds in all, with ExMDStdPropertySet; the device may take the value
+    /// later, and what it throws then is traced.
+    void setAndWait(const T& value, double seconds);
+
 protected:
     virtual void performSet(const T& value) = 0;
     virtual void performGet(T& value) = 0;
 
+    /// A property that has its value when performSet() returns need not have its own.
+    virtual void performSetAndWait(const T& value, const LkTimeLimit&) { performSet(value); }
+
     /// A property whose performGet() never waits for long need not have its own.
     virtual void performTimedGet(T& value, double) { performGet(value); }
+
+private:
+    void checkAttribute(unsigned attribute, const char* operation);
+    void checkSet(const T& value);
 };
 
 }  // namespace Orv

@@ -25,62 +25,6 @@ RCShdPtr<DevMDPropertyDescriptorAny> DevMDPropertyAny::getDescriptor() const {
     return nullptr;
 }
 
-// --- what a property needs ---
-
-void DevMDStdPropertyObserver::set(ObjPtr<DevMDPropertyAEO> aeo) {
-    {
-        const LkGuard guard(_lock);
-        if (!_held.isNull() && _held->aeo.get() == aeo.get()) {
-            static_cast<void>(aeo.release());  // it is owned already
-            return;
-        }
-    }
-    RCShdPtr<Held> held;
-    if (!aeo.isNull()) held = RCShdPtr<Held>(new Held(std::move(aeo)));
-    const LkGuard guard(_lock);
-    _isSet.store(!held.isNull(), std::memory_order_release);
-    _held.swap(held);
-    // The guard goes first, and then the old object, unless it is running just now.
-}
-
-void DevMDStdPropertyObserver::notify(unsigned mask) noexcept {
-    if (!_isSet.load(std::memory_order_acquire)) return;
-    try {
-        RCShdPtr<Held> held;
-        {
-            const LkGuard guard(_lock);
-            held = _held;
-        }
-        if (!held.isNull()) held->aeo->propertyChanged(mask);
-    } catch (...) {
-        Assertions::traceCurrentException("telling of a property's change");
-    }
-}
-
-DevMDStdPropertyGetACO::~DevMDStdPropertyGetACO() {
-    if (_sema == nullptr) return;
-    _success = false;
-    _sema->post();
-}
-
-void DevMDStdPropertyGetACO::performExecute() {
-    std::exchange(_sema, nullptr)->post();
-}
-
-DevMDStdGetAnswer::~DevMDStdGetAnswer() noexcept(false) = default;
-
-DevMDStdTimedGetACO::~DevMDStdTimedGetACO() {
-    if (_answer.isNull()) return;
-    _answer->success = false;
-    performExecute();
-}
-
-void DevMDStdTimedGetACO::performExecute() {
-    _answer->isAnswered.store(true, std::memory_order_release);
-    _answer->answered.post();
-    _answer.reset();
-}
-
 // --- property sets ---
 
 namespace {

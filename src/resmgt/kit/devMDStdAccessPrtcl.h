@@ -34,6 +34,7 @@ public:
 
     void performOpen() override;
     void performClose() override;
+    int getQueueLength() const override { return _fifo->getSize(); }
 
     /// Of the threads of all devices: "std-device", equal to "RealTime". Relate it to others to
     /// place them all.

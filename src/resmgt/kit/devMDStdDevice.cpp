@@ -1,6 +1,8 @@
 #include "devMDStdDevice.h"
 
+#include <algorithm>
 #include <string_view>
+#include <utility>
 
 namespace Orv {
 
@@ -31,6 +33,24 @@ public:
     }
     ObjPtr<DevANO> createCloseANO() override {
         return createANO([this] { _device.close(); });
+    }
+
+private:
+    DevMDStdDevice& _device;
+};
+
+/// Tells the device of the end of a stream. The device outlives its thread.
+class DevMDStdDevice::Input : public DevMDStdStreamFunctionSink {
+public:
+    Input(DevMDStdDevice& device, const LiString& name, const LiString& description, Take take,
+          IsCompatible isCompatible)
+        : DevMDStdStreamFunctionSink(name, description, device.getFifo(), std::move(take),
+                                     std::move(isCompatible)),
+          _device(device) {}
+
+protected:
+    void ended() override {
+        if (!_device.hasOpenInputs()) _device.noteInputsEnded();
     }
 
 private:
@@ -71,19 +91,26 @@ void DevMDStdDevice::addToSet(const LiString& path, RCShdPtr<DevMDPropertyAny> p
 }
 
 RCShdPtr<DevMDStdStreamPassiveSink> DevMDStdDevice::addSink(
-    const LiString& name, const LiString& description, DevMDStdFunctionSinkFactory::Take take) {
-    ObjPtr<DevMDStdStreamPassiveSinkANOFactory> factory(
-        new DevMDStdFunctionSinkFactory(std::move(take)));
-    RCShdPtr<DevMDStdStreamPassiveSink> sink(
-        new DevMDStdStreamPassiveSink(name, description, _fifo, std::move(factory)));
+    const LiString& name, const LiString& description, DevMDStdStreamFunctionSink::Take take,
+    DevMDStdStreamFunctionSink::IsCompatible isCompatible) {
+    const RCShdPtr<DevMDStdStreamFunctionSink> sink(
+        new Input(*this, name, description, std::move(take), std::move(isCompatible)));
+    _inputs.reserve(_inputs.size() + 1);
     addStream(sink);
+    _inputs.push_back(sink);
     return sink;
 }
 
+bool DevMDStdDevice::hasOpenInputs() const {
+    return std::any_of(_inputs.begin(), _inputs.end(),
+                       [](const auto& input) { return input->isOpen(); });
+}
+
 RCShdPtr<DevMDStdStreamLoopSource> DevMDStdDevice::addLoopSource(
-    const LiString& name, const LiString& description, DevMDStdStreamLoopSource::Loop loop) {
-    RCShdPtr<DevMDStdStreamLoopSource> source(
-        new DevMDStdStreamLoopSource(name, description, std::move(loop)));
+    const LiString& name, const LiString& description, DevMDStdStreamLoopSource::Loop loop,
+    DevMDStdStreamLoopSource::Loop prepare, unsigned stackSize) {
+    RCShdPtr<DevMDStdStreamLoopSource> source(new DevMDStdStreamLoopSource(
+        name, description, std::move(loop), std::move(prepare), stackSize));
     addStream(source);
     return source;
 }

@@ -1,12 +1,13 @@
 #pragma once
 
 #include <functional>
+#include <vector>
 
 #include "devMDStdAccessPrtcl.h"
 #include "devMDStdFunctionPropertyFactory.h"
-#include "devMDStdFunctionSinkFactory.h"
 #include "devMDStdProperty.h"
 #include "devMDStdPropertyPrtcl.h"
+#include "devMDStdStreamFunctionSink.h"
 #include "devMDStdStreamLoopSource.h"
 #include "devMDStdStreamPassiveSource.h"
 #include "devMDStdStreamPrtcl.h"
@@ -16,9 +17,10 @@ namespace Orv {
 /// Base of an ordinary device: properties behind functions, streams, opening and closing. All
 /// functions of the device run on its own thread, so what they use needs no lock.
 ///
-/// Derive from it, and add properties and streams in the constructor.
+/// Derive from it, and add properties and streams in the constructor, or in open() where only an
+/// open device knows them.
 ///
-/// - Threads: the adding functions before the device is opened; the rest says so itself.
+/// - Threads: the adding functions until open() has returned; the rest says so itself.
 class ORV_RESMGT_API DevMDStdDevice : public DevMDStdAccessPrtcl,
                                       public DevMDStdPropertyPrtcl,
                                       public DevMDStdStreamPrtcl {
@@ -50,14 +52,21 @@ protected:
         typename DevMDStdFunctionPropertyFactory<T>::Setter setter = nullptr,
         RCShdPtr<DevMDPropertyDescriptor<T>> descriptor = nullptr);
 
-    /// A sink that other devices push into; @p take sees each element.
-    RCShdPtr<DevMDStdStreamPassiveSink> addSink(const LiString& name, const LiString& description,
-                                                DevMDStdFunctionSinkFactory::Take take);
+    /// A sink that other devices push into; @p take sees each element. What it throws, the source's
+    /// next push() throws; see DevMDStdStreamFunctionSink.
+    RCShdPtr<DevMDStdStreamPassiveSink> addSink(
+        const LiString& name, const LiString& description, DevMDStdStreamFunctionSink::Take take,
+        DevMDStdStreamFunctionSink::IsCompatible isCompatible = nullptr);
 
-    /// A source that pushes: @p loop runs on a thread of its own while it is connected.
-    RCShdPtr<DevMDStdStreamLoopSource> addLoopSource(const LiString& name,
-                                                     const LiString& description,
-                                                     DevMDStdStreamLoopSource::Loop loop);
+    /// On the device's thread: of the sinks of addSink(), the last has seen its terminal element.
+    virtual void inputsEnded() {}
+    bool hasOpenInputs() const;  ///< May anything still come into them?
+
+    /// A source that pushes: @p loop runs on a thread of its own while it is connected, after
+    /// @p prepare, which connecting waits for; see DevMDStdStreamLoopSource.
+    RCShdPtr<DevMDStdStreamLoopSource> addLoopSource(
+        const LiString& name, const LiString& description, DevMDStdStreamLoopSource::Loop loop,
+        DevMDStdStreamLoopSource::Loop prepare = nullptr, unsigned stackSize = 0);
 
     /// A source that others pull from, and into which the device puts what it has.
     RCShdPtr<DevMDStdStreamPassiveSource> addPassiveSource(
@@ -68,11 +77,14 @@ protected:
 
 private:
     class AccessFactory;
+    class Input;
 
     const LiString _name;
     const RCShdPtr<DevMDStdFifo> _fifo;
+    std::vector<RCShdPtr<DevMDStdStreamFunctionSink>> _inputs;
 
     DevMDStdDevice(const LiString& name, const RCShdPtr<DevMDStdFifo>& fifo);
+    virtual void noteInputsEnded() { inputsEnded(); }
     void addToSet(const LiString& path, RCShdPtr<DevMDPropertyAny> property);
     static LiString getLastName(const LiString& path);
 };

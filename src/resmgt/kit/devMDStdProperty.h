@@ -2,11 +2,11 @@
 
 #include <atomic>
 
+#include "devAEOSlot.h"
 #include "devMDProperty.h"
 #include "devMDStdFifo.h"
 #include "devMDStdPropertyANOFactory.h"
 #include "devMDStdPropertyGetACO.h"
-#include "devMDStdPropertyObserver.h"
 
 namespace Orv {
 
@@ -38,12 +38,15 @@ public:
     RCShdPtr<DevMDPropertyDescriptorAny> getDescriptor() const override { return _descriptor; }
 
     /// Tells the observer, if there is one, what has changed; for the device.
-    void notify(unsigned mask) { _observer.notify(mask); }
+    void notify(unsigned mask) {
+        _observer.tell([mask](DevMDPropertyAEO& aeo) { aeo.propertyChanged(mask); });
+    }
 
 protected:
     void performSet(const T& value) override;
     void performGet(T& value) override;
     void performTimedGet(T& value, double seconds) override;
+    void performSetAndWait(const T& value, const LkTimeLimit& limit) override;
     virtual void setAttributes(unsigned attributes) { _attributes = attributes; }
 
 private:
@@ -57,7 +60,7 @@ private:
     const LiString _name;
     const LiString _description;
     std::atomic<unsigned> _attributes;
-    DevMDStdPropertyObserver _observer;
+    DevAEOSlot<DevMDPropertyAEO> _observer;
     const ObjPtr<DevMDStdPropertyANOFactory<T>> _factory;
     const RCShdPtr<DevMDStdFifo> _fifo;
     const RCShdPtr<DevMDPropertyDescriptor<T>> _descriptor;

@@ -1,7 +1,9 @@
 #pragma once
 
 #include <atomic>
+#include <exception>
 
+#include "devAEOSlot.h"
 #include "devMDStream.h"
 #include "devWaitGraph.h"
 #include "lkCondVar.h"
@@ -24,9 +26,12 @@ public:
     void start() { setState(State::RUNNING); }
     void stop() { setState(State::FREE); }
     State getState() const;
+    std::exception_ptr getFailure() const;
+    void setEndAEO(ObjPtr<DevAEO> aeo) { _aeo.set(std::move(aeo)); }
 
-    /// Sets how it ended, if it was running.
-    void end(State state);
+    /// Sets how it ended, if it was running; what has ended may still turn out to have failed.
+    void end(State state, std::exception_ptr failure = nullptr);
+    void tellEnd() noexcept;  ///< Executes the event object, unless the end is free or running.
 
     /// The calling thread's use of the partner, which disconnect() waits for.
     class Use {
@@ -51,8 +56,10 @@ private:
     DevWaitGraph::Target _target;  // the thread that uses the partner
     RCShdPtr<Partner> _partner ORV_GUARDED_BY(_mutex);
     State _state ORV_GUARDED_BY(_mutex) = State::FREE;
+    std::exception_ptr _failure ORV_GUARDED_BY(_mutex);
     LkThreadId _user ORV_GUARDED_BY(_mutex);
     int _nbUses ORV_GUARDED_BY(_mutex) = 0;
+    DevAEOSlot<DevAEO> _aeo;
 
     void setState(State state);
 };

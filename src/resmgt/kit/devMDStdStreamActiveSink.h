@@ -24,6 +24,8 @@ public:
     void stop() override;
     void disconnect() override { _end.disconnect(); }
     State getState() override { return _end.getState(); }
+    std::exception_ptr getFailure() override { return _end.getFailure(); }
+    void setEndAEO(ObjPtr<DevAEO> aeo) override { _end.setEndAEO(std::move(aeo)); }
 
     /// The next element, waiting for it. After a terminal one there is only STOPPED; a source that
     /// fails gives FAILED.

@@ -23,17 +23,25 @@ public:
     void stop() override;
     void disconnect() override { _end.disconnect(); }
     State getState() override { return _end.getState(); }
+    std::exception_ptr getFailure() override { return _end.getFailure(); }
+    void setEndAEO(ObjPtr<DevAEO> aeo) override { _end.setEndAEO(std::move(aeo)); }
 
     /// Delivers an element, waiting while the sink is full. Terminal ones end the stream, as does a
     /// sink that fails.
     /// @return whether the stream goes on; if not, elements are destroyed unseen.
     bool push(ObjPtr<DevMDStreamElem> elem);
 
+protected:
+    /// Ends the stream with FAILED, if it still runs, for the reason given.
+    void fail(std::exception_ptr failure);
+
 private:
     const LiString _name;
     const LiString _description;
     std::atomic<bool> _isAvailable{true};
     DevMDStdStreamActiveEnd<DevMDStreamPassiveSink> _end;
+
+    bool pushAndJudge(ObjPtr<DevMDStreamElem> elem, std::exception_ptr failure);
 };
 
 }  // namespace Orv

@@ -1,5 +1,8 @@
 #pragma once
 
+#include <exception>
+
+#include "devAEOSlot.h"
 #include "devMDStdFifo.h"
 #include "devMDStreamSink.h"
 #include "lkLock.h"
@@ -7,7 +10,7 @@
 namespace Orv {
 
 /// Makes the requests that hand a stream's elements to the device; supplied by the device. For a
-/// function that takes them, DevMDStdFunctionSinkFactory is ready.
+/// function that takes them, DevMDStdStreamFunctionSink is ready.
 ///
 /// - Threads: called by any thread; the requests run on the device's thread.
 class ORV_RESMGT_API DevMDStdStreamPassiveSinkANOFactory {
@@ -20,8 +23,8 @@ public:
 /// last one the device sees is terminal, STOPPED if the source gave none.
 ///
 /// - Threads: any.
-/// - Errors: RCEx::ExNullPtr without a queue; DevPrtclEx::ExMDStdFifoClosed if the device is closed
-///   or dead.
+/// - Errors of push(): RCEx::ExNullPtr without a queue; DevPrtclEx::ExMDStdFifoClosed if the device
+///   is closed or dead; what the device failed with.
 class ORV_RESMGT_API DevMDStdStreamPassiveSink : public DevMDStreamPassiveSink {
 public:
     DevMDStdStreamPassiveSink(const LiString& name, const LiString& description,
@@ -33,10 +36,20 @@ public:
     LiString getDescription() override { return _description; }
     bool isAvailable() override { return _isAvailable.load(); }
     State getState() override;
+    std::exception_ptr getFailure() override;
+    void setEndAEO(ObjPtr<DevAEO> aeo) override { _aeo.set(std::move(aeo)); }
     void start() override;
     void stop() override;
     bool isReady() override { return _fifo->hasRoom(); }
     void push(ObjPtr<DevMDStreamElem> elem) override;
+
+    /// For the device: it cannot use what came in. The state becomes FAILED, and the source's next
+    /// push() throws @p failure; a terminal element is taken all the same.
+    void fail(std::exception_ptr failure);
+
+protected:
+    void setFailure(std::exception_ptr failure);  ///< The first half of fail(), for under a lock.
+    void tellEnd() noexcept;                      ///< The second.
 
 private:
     const LiString _name;
@@ -44,7 +57,11 @@ private:
     const RCShdPtr<DevMDStdFifo> _fifo;
     const ObjPtr<DevMDStdStreamPassiveSinkANOFactory> _factory;
     std::atomic<bool> _isAvailable{true};
-    std::atomic<State> _state{State::FREE};
+    std::atomic<State> _state{State::FREE};  // what was pushed
+    std::atomic<bool> _hasFailed{false};     // what the device made of it
+    LkLock _failureLock{"DevMDStdStreamPassiveSink"};
+    std::exception_ptr _failure ORV_GUARDED_BY(_failureLock);
+    DevAEOSlot<DevAEO> _aeo;
 };
 
 }  // namespace Orv

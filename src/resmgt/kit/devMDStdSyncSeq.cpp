@@ -152,4 +152,25 @@ void DevMDStdSyncSeqDevice::recover(DevMDSyncSeqRequest&) {}
 void DevMDStdSyncSeqDevice::stop(DevMDSyncSeqRequest&) {}
 void DevMDStdSyncSeqDevice::abort(DevMDSyncSeqRequest&) {}
 
+void DevMDStdSyncSeqDevice::stopWhenInputsEnd(DevMDSyncSeqRequest& request) {
+    if (hasOpenInputs()) _stopping = request.postpone();
+}
+
+/// A stop that is still due leads to the sequence, and from there back to this device.
+void DevMDStdSyncSeqDevice::performClose() {
+    try {
+        DevMDStdDevice::performClose();
+    } catch (...) {
+        _stopping = DevMDSyncSeqDone();
+        throw;
+    }
+    _stopping = DevMDSyncSeqDone();
+}
+
+void DevMDStdSyncSeqDevice::noteInputsEnded() {
+    DevMDSyncSeqDone stopping = std::move(_stopping);  // has failed if this throws
+    inputsEnded();
+    stopping.done();
+}
+
 }  // namespace Orv

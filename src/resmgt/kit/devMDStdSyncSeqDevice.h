@@ -19,6 +19,8 @@ public:
     explicit DevMDStdSyncSeqDevice(const LiString& name, int capacity = STANDARD_CAPACITY);
     ~DevMDStdSyncSeqDevice() noexcept(false) override;
 
+    void performClose() override;
+
 protected:
     /// Prepare, and say signals.ready() then or later; keep the signals for lockLost(). By default
     /// ready at once.
@@ -33,8 +35,16 @@ protected:
     virtual void stop(DevMDSyncSeqRequest& request);
     virtual void abort(DevMDSyncSeqRequest& request);
 
+    /// For stop(): what is still on its way into the sinks of addSink() comes first; done when none
+    /// of them is open, after inputsEnded().
+    void stopWhenInputsEnd(DevMDSyncSeqRequest& request);
+
 private:
     class Factory;
+
+    DevMDSyncSeqDone _stopping;  // of the device's thread
+
+    void noteInputsEnded() override;
 };
 
 }  // namespace Orv

@@ -1,8 +1,12 @@
 #include "devMDStdThreadProtocol.h"
 
+#include <cxxabi.h>
+#include <string>
+
 #include "assertions.h"
 #include "devPrtclEx.h"
 #include "lgSpan.h"
+#include "mtThread.h"
 
 namespace Orv {
 
@@ -39,7 +43,7 @@ void DevMDStdThreadProtocol::execute(DevANOQueueEntry& entry) {
     }
 }
 
-void DevMDStdThreadProtocol::performBody(MtThread*) {
+void DevMDStdThreadProtocol::performBody(MtThread* thread) {
     DevMDStdFifo& fifo = *_fifo;
     const DevWaitGraph::Serving serving(fifo.getTarget());
     // However the thread ends, nobody waits for it afterwards.
@@ -55,9 +59,20 @@ void DevMDStdThreadProtocol::performBody(MtThread*) {
     } closer{fifo};
     try {
         performRun();
+    } catch (const abi::__forced_unwind&) {
+        throw;
     } catch (const DevPrtclEx::ExMDStdFifoClosed&) {
-        if (!fifo.isClosed()) throw;
+        if (!fifo.isClosed()) traceDeath(*thread);
+    } catch (...) {
+        traceDeath(*thread);
     }
+}
+
+/// At once, and not when somebody joins the thread: that may be hours later.
+void DevMDStdThreadProtocol::traceDeath(MtThread& thread) noexcept {
+    const std::string where =
+        "running the device \"" + std::string(thread.getName().getText()) + "\", which has died";
+    Assertions::traceCurrentException(where.c_str());
 }
 
 void DevMDStdThreadProtocol::performRun() {

@@ -35,8 +35,8 @@ public:
     void performStop(MtThread* thread) override;
 
 protected:
-    /// By default consumes until the thread shall leave. What it throws ends the thread and thereby
-    /// the device.
+    /// By default consumes until the thread shall leave. What it throws is traced and ends the
+    /// thread and thereby the device.
     virtual void performRun();
 
 private:
@@ -44,6 +44,7 @@ private:
     std::atomic<bool> _isLeaving{false};
 
     static void execute(DevANOQueueEntry& entry);
+    static void traceDeath(MtThread& thread) noexcept;
 };
 
 }  // namespace Orv

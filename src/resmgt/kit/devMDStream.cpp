@@ -80,6 +80,12 @@ bool DevMDStream::isCompatible(const LiString& description) {
     return areCompatible(getDescription(), description);
 }
 
+std::exception_ptr DevMDStream::getFailure() {
+    return nullptr;
+}
+
+void DevMDStream::setEndAEO(ObjPtr<DevAEO>) {}
+
 bool DevMDStream::areCompatible(const LiString& sink, const LiString& source) {
     if (sink.isEmpty()) return true;
     Description taken(sink.getText());

@@ -1,7 +1,10 @@
 #pragma once
 
+#include <exception>
+
 #include "devMDStreamElem.h"
 #include "liString.h"
+#include "objPtr.h"
 
 namespace Orv {
 
@@ -29,6 +32,11 @@ public:
 
     /// How the connection fares, as far as this end knows.
     virtual State getState() { return isAvailable() ? State::FREE : State::RUNNING; }
+    virtual std::exception_ptr getFailure();  ///< Why it FAILED; null if that is not known.
+
+    /// Replaces the one event object that is executed when the state has become ENDED or FAILED, on
+    /// the thread that made it so; null for none. An end that does not keep it tells nobody.
+    virtual void setEndAEO(ObjPtr<DevAEO> aeo);
 
     /// Whether a sink that describes itself as @p sink takes what a source describes: an empty sink
     /// takes everything; else type and subtype are equal or "*" in the sink's, and keys that both

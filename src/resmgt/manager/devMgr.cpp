@@ -29,6 +29,9 @@ public:
         return _mediator->getPrtcl(name);
     }
 
+    std::vector<Device> getDevices() const override { return _mediator->getDevices(); }
+    int getNbNotifications() const override { return _mediator->getFifo()->getSize(); }
+
 private:
     const RCShdPtr<DevMgrMediator> _mediator;
 };

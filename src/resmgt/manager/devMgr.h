@@ -10,8 +10,8 @@
 namespace Orv {
 
 /// A manager: hosts devices, which it knows by their names in the DevRegistry, and gives access to
-/// their properties, streams and sequences. Managers are independent of each other, each with devices and a
-/// notification thread of its own.
+/// their properties, streams and sequences. Managers are independent of each other, each with
+/// devices and a notification thread of its own.
 ///
 /// - Threads: any.
 /// - Ownership: the devices are closed when the manager and all its access objects have gone, which
@@ -33,6 +33,12 @@ public:
     /// @throws DevPrtclEx::ExNameNotRegistered; DevMgrEx::BadMDPrtclImp if it could only be opened
     ///   after itself; what making or opening it throws, after which a later call tries afresh.
     virtual RCShdPtr<DevMDPrtcl> getPrtcl(const LiString& name) = 0;
+
+    // What there is and where it is held up: snapshots, for programs that show it.
+
+    using Device = DevMgrMediator::Device;
+    virtual std::vector<Device> getDevices() const = 0;  ///< In order of creation.
+    virtual int getNbNotifications() const = 0;          ///< That observers have not heard yet.
 
 protected:
     DevMgr() = default;

@@ -1,3 +1,5 @@
+#include <algorithm>
+
 #include "assertions.h"
 #include "devMDAccessPrtcl.h"
 #include "devMDPropertyPrtcl.h"
@@ -8,9 +10,9 @@
 
 namespace Orv {
 
-void DevMgrDevice::open(const LiString& name) {
+void DevMgrDevice::open() {
     try {
-        const RCShdPtr<DevMDPrtcl> prtcl = DevRegistry::getInstance().createPrtcl(name);
+        const RCShdPtr<DevMDPrtcl> prtcl = DevRegistry::getInstance().createPrtcl(_name);
         ORV_ASSERT(!prtcl.isNull());
         if (auto* const access = dynamic_cast<DevMDAccessPrtcl*>(prtcl.get())) {
             access->performOpen();
@@ -26,13 +28,19 @@ void DevMgrDevice::open(const LiString& name) {
 }
 
 const RCShdPtr<DevMDPrtcl>& DevMgrDevice::await() {
-    if (!_isOpen.load(std::memory_order_acquire)) {
+    if (!isOpen()) {
         const DevWaitGraph::Wait wait(DevWaitGraph::Kind::ANSWER, _opener, nullptr);
-        if (wait.isRefused()) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
+        if (wait.isRefused()) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__, _name);
         _ready.wait();
         if (_failure != nullptr) std::rethrow_exception(_failure);
     }
     return _prtcl;
+}
+
+int DevMgrDevice::getQueueLength() const {
+    if (!isOpen()) return 0;
+    const auto* const access = dynamic_cast<const DevMDAccessPrtcl*>(_prtcl.get());
+    return access != nullptr ? access->getQueueLength() : 0;
 }
 
 void DevMgrDevice::close() noexcept {
@@ -41,7 +49,8 @@ void DevMgrDevice::close() noexcept {
             access->performClose();
         }
     } catch (...) {
-        Assertions::traceCurrentException("closing a device");
+        const std::string where = "closing the device \"" + std::string(_name.getText()) + '"';
+        Assertions::traceCurrentException(where.c_str());
     }
 }
 
@@ -51,7 +60,11 @@ RCShdPtr<DevMDPropertyAny> DevMgrDevice::getProperty(const DevMgrPropertyParser&
     for (const LiString& set : path.getPropertySetPath()) key.append(set.getText()).append(" ");
     key.append(path.getPropertyName().getText());
     const auto found = _index.find(key);
-    if (found == _index.end()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    if (found == _index.end()) {
+        std::string subject = std::string(_name.getText()) + ' ' + key;
+        std::replace(subject.begin(), subject.end(), ' ', ':');
+        throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, LiString(subject.c_str()));
+    }
     return found->second;
 }
 
@@ -60,7 +73,7 @@ void DevMgrDevice::makeIndex() {
     const LkGuard guard(_indexMutex);
     if (_isIndexed.load(std::memory_order_relaxed)) return;
     auto* const prtcl = dynamic_cast<DevMDPropertyPrtcl*>(_prtcl.get());
-    if (prtcl == nullptr) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
+    if (prtcl == nullptr) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__, _name);
     _index.clear();
     addToIndex(std::string(), prtcl->getPropertyIter(), prtcl->getPropertySetIter());
     _isIndexed.store(true, std::memory_order_release);

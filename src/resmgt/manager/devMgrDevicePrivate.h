@@ -21,8 +21,10 @@ class DevMgrPropertyParser;
 /// - Threads: any.
 class DevMgrDevice : public RCBase<LkCounter<long>> {
 public:
+    explicit DevMgrDevice(const LiString& name) : _name(name) {}
+
     /// For whoever made this object, once: makes the protocol and opens it.
-    void open(const LiString& name);
+    void open();
 
     /// For all others: the protocol, once it is open.
     /// @throws what open() threw there, DevMgrEx::BadMDPrtclImp if the opener waits for the caller.
@@ -34,8 +36,11 @@ public:
     RCShdPtr<DevMDPropertyAny> getProperty(const DevMgrPropertyParser& path);
 
     DevWaitGraph::Target& getOpener() noexcept { return _opener; }
+    bool isOpen() const noexcept { return _isOpen.load(std::memory_order_acquire); }
+    int getQueueLength() const;
 
 private:
+    const LiString _name;
     RCShdPtr<DevMDPrtcl> _prtcl;  // before _isReady
     std::exception_ptr _failure;  // before _isReady
     std::atomic<bool> _isOpen{false};

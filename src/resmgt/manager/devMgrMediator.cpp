@@ -39,7 +39,7 @@ RCShdPtr<DevMgrDevice> DevMgrMediator::getDevice(const LiString& name) {
         if (const RCShdPtr<DevMgrDevice>* const found = _devices.find(name)) {
             device = *found;
         } else {
-            device = RCShdPtr<DevMgrDevice>(new DevMgrDevice);
+            device = RCShdPtr<DevMgrDevice>(new DevMgrDevice(name));
             _devices.insert(name, device);
             opening.emplace(device->getOpener());  // before others can wait for it
         }
@@ -49,7 +49,7 @@ RCShdPtr<DevMgrDevice> DevMgrMediator::getDevice(const LiString& name) {
         return device;
     }
     try {
-        device->open(name);
+        device->open();
     } catch (...) {
         const LkGuard guard(_configLock);
         _devices.erase(name);
@@ -65,6 +65,20 @@ RCShdPtr<DevMDPrtcl> DevMgrMediator::getPrtcl(const LiString& name) {
 bool DevMgrMediator::isPrtclCreated(const LiString& name) {
     const LkGuard guard(_configLock);
     return _devices.find(name) != nullptr;
+}
+
+std::vector<DevMgrMediator::Device> DevMgrMediator::getDevices() {
+    std::vector<std::pair<LiString, RCShdPtr<DevMgrDevice>>> found;
+    {
+        const LkGuard guard(_configLock);
+        found.assign(_devices.begin(), _devices.end());
+    }
+    std::vector<Device> devices;
+    devices.reserve(found.size());
+    for (const auto& [name, device] : found) {
+        devices.push_back({name, device->isOpen(), device->getQueueLength()});
+    }
+    return devices;
 }
 
 RCShdPtr<DevMDPropertyAny> DevMgrMediator::getProperty(const DevMgrPropertyParser& path) {

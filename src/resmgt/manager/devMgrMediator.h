@@ -1,6 +1,7 @@
 #pragma once
 
 #include <set>
+#include <vector>
 
 #include "devMDPropertyAny.h"
 #include "devMDPrtcl.h"
@@ -29,6 +30,13 @@ class ORV_RESMGT_API DevMgrMediator : public RCBase<LkCounter<long>> {
 public:
     static constexpr int FIFO_CAPACITY = 25;
 
+    /// How a device of the manager fares.
+    struct Device {
+        LiString name;
+        bool isOpen;        ///< Else it is being opened.
+        int nbWaiting = 0;  ///< Requests that it has not come to yet.
+    };
+
     DevMgrMediator();
     ~DevMgrMediator() noexcept(false) override;
 
@@ -41,6 +49,7 @@ public:
     ///   tries afresh.
     RCShdPtr<DevMDPrtcl> getPrtcl(const LiString& name);
     bool isPrtclCreated(const LiString& name);
+    std::vector<Device> getDevices();  ///< In the order in which their creation began.
 
     /// @throws what getPrtcl() throws; DevMgrEx::BadMDPrtclImp if the device has no properties;
     ///   DevMgrEx::NameNotRegistered for an unknown set or property.

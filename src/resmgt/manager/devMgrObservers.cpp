@@ -59,8 +59,13 @@ private:
 
 // --- one property ---
 
+void DevMgrObserverList::Entry::tell(unsigned mask) noexcept {
+    call("telling an observer of a property's change",
+         [&] { observer->performNotify(DevMgrPropertyObserverHint(property, mask)); });
+}
+
 void DevMgrObserverList::add(const RCShdPtr<Entry>& entry) {
-    const LkGuard guard(_mutex);
+    const LkGuard guard(_lock);
     for (const RCShdPtr<Entry>& other : _entries) {
         if (other->owner == entry->owner && other->observer == entry->observer) return;
     }
@@ -69,62 +74,32 @@ void DevMgrObserverList::add(const RCShdPtr<Entry>& entry) {
 
 RCShdPtr<DevMgrObserverList::Entry> DevMgrObserverList::remove(
     const void* owner, const DevMgrPropertyObserver& observer) {
-    const LkGuard guard(_mutex);
+    const LkGuard guard(_lock);
     const auto found = std::find_if(_entries.begin(), _entries.end(), [&](const auto& entry) {
         return entry->owner == owner && entry->observer.get() == &observer;
     });
     if (found == _entries.end()) return nullptr;
     RCShdPtr<Entry> entry = std::move(*found);
     _entries.erase(found);
-    entry->isDetached = true;
     return entry;
 }
 
 bool DevMgrObserverList::isEmpty() const {
-    const LkGuard guard(_mutex);
+    const LkGuard guard(_lock);
     return _entries.empty();
-}
-
-void DevMgrObserverList::waitUntilIdle(const Entry& entry) {
-    {
-        const LkGuard guard(_mutex);
-        if (_running != &entry || _runner.isCurrentThread()) return;
-    }
-    // If the observer in turn waits for the calling thread, its wait ends with an error.
-    const DevWaitGraph::Wait wait(DevWaitGraph::Kind::END, _manager->getTarget(), nullptr);
-    const LkGuard guard(_mutex);
-    while (_running == &entry) _idle.wait(guard);
 }
 
 void DevMgrObserverList::deliver(unsigned mask) noexcept {
     try {
         std::vector<RCShdPtr<Entry>> entries;
         {
-            const LkGuard guard(_mutex);
+            const LkGuard guard(_lock);
             entries = _entries;
         }
-        for (const RCShdPtr<Entry>& entry : entries) call(*entry, mask);
+        for (const RCShdPtr<Entry>& entry : entries) entry->tell(mask);
     } catch (...) {
         Assertions::traceCurrentException("delivering a property's change");
     }
-}
-
-void DevMgrObserverList::call(Entry& entry, unsigned mask) noexcept {
-    {
-        const LkGuard guard(_mutex);
-        if (entry.isDetached) return;
-        _running = &entry;
-        _runner.setCurrentThread();
-    }
-    try {
-        entry.observer->performNotify(DevMgrPropertyObserverHint(entry.property, mask));
-    } catch (...) {
-        Assertions::traceCurrentException("telling an observer of a property's change");
-    }
-    const LkGuard guard(_mutex);
-    _running = nullptr;
-    _runner.reset();
-    _idle.broadcast();
 }
 
 // --- all of them ---
@@ -133,7 +108,7 @@ void DevMgrObservers::attach(const void* owner, const RCShdPtr<DevMDPropertyAny>
                              const RCShdPtr<DevMgrPropertyObserver>& observer) {
     const LiUuid uuid = property->getUuid();
     const RCShdPtr<DevMgrObserverList::Entry> entry(
-        new DevMgrObserverList::Entry(owner, property, observer));
+        new DevMgrObserverList::Entry(_fifo, owner, property, observer));
     const LkGuard guard(_lock);
     RCShdPtr<DevMgrObserverList>& list = _lists[uuid];
     if (!list.isNull()) {
@@ -141,7 +116,7 @@ void DevMgrObservers::attach(const void* owner, const RCShdPtr<DevMDPropertyAny>
         return;
     }
     try {
-        list = RCShdPtr<DevMgrObserverList>(new DevMgrObserverList(_fifo));
+        list = RCShdPtr<DevMgrObserverList>(new DevMgrObserverList);
         list->add(entry);
         property->setObserverAEO(ObjPtr<DevMDPropertyAEO>(new PropertyAEO(_fifo, list)));
     } catch (...) {
@@ -161,13 +136,15 @@ void DevMgrObservers::detach(const void* owner, DevMDPropertyAny& property,
             list = found->second;
             entry = list->remove(owner, observer);
         }
-        if (entry.isNull()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+        if (entry.isNull()) {
+            throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, property.getName());
+        }
         if (list->isEmpty()) {
             _lists.erase(found);
             property.setObserverAEO(nullptr);
         }
     }
-    list->waitUntilIdle(*entry);
+    entry->detach();
 }
 
 }  // namespace Orv

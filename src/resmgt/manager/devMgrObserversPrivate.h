@@ -3,13 +3,10 @@
 #include <unordered_map>
 #include <vector>
 
-#include "devMgrFifo.h"
+#include "devMgrCallbackPrivate.h"
 #include "devMgrPropertyObserver.h"
 #include "liUuid.h"
-#include "lkCondVar.h"
 #include "lkLock.h"
-#include "lkMutex.h"
-#include "lkThreadId.h"
 
 namespace Orv {
 
@@ -19,40 +16,32 @@ namespace Orv {
 /// - Threads: deliver() on the manager's thread, everything else by any.
 class DevMgrObserverList : public RCBase<LkCounter<long>> {
 public:
-    struct Entry : RCBase<LkCounter<long>> {
-        Entry(const void* accessObject, RCShdPtr<DevMDPropertyAny> observed,
-              RCShdPtr<DevMgrPropertyObserver> observing)
-            : owner(accessObject), property(std::move(observed)), observer(std::move(observing)) {}
+    class Entry : public DevMgrCallback {
+    public:
+        Entry(RCShdPtr<DevMgrFifo> manager, const void* accessObject,
+              RCShdPtr<DevMDPropertyAny> observed, RCShdPtr<DevMgrPropertyObserver> observing)
+            : DevMgrCallback(std::move(manager)),
+              owner(accessObject),
+              property(std::move(observed)),
+              observer(std::move(observing)) {}
+        void tell(unsigned mask) noexcept;
+
         const void* const owner;
         const RCShdPtr<DevMDPropertyAny> property;
         const RCShdPtr<DevMgrPropertyObserver> observer;
-        bool isDetached = false;  // guarded by the list's mutex
     };
-
-    /// @param manager  who serves: the manager's thread.
-    explicit DevMgrObserverList(RCShdPtr<DevMgrFifo> manager) : _manager(std::move(manager)) {}
 
     void add(const RCShdPtr<Entry>& entry);  ///< Once for each owner and observer.
 
-    /// @return null if it is not there.
+    /// For the caller to detach. @return null if it is not there.
     RCShdPtr<Entry> remove(const void* owner, const DevMgrPropertyObserver& observer);
     bool isEmpty() const;
-
-    /// Returns when a removed entry's observer is not running any more; at once on the thread that
-    /// runs it.
-    void waitUntilIdle(const Entry& entry);
 
     void deliver(unsigned mask) noexcept;
 
 private:
-    const RCShdPtr<DevMgrFifo> _manager;
-    mutable LkMutex _mutex{"DevMgrObserverList"};
-    LkCondVar _idle{"DevMgrObserverList idle"};
-    std::vector<RCShdPtr<Entry>> _entries ORV_GUARDED_BY(_mutex);
-    const Entry* _running ORV_GUARDED_BY(_mutex) = nullptr;
-    LkThreadId _runner ORV_GUARDED_BY(_mutex);
-
-    void call(Entry& entry, unsigned mask) noexcept;
+    mutable LkLock _lock{"DevMgrObserverList"};
+    std::vector<RCShdPtr<Entry>> _entries ORV_GUARDED_BY(_lock);
 };
 
 /// All observed properties of a manager. A property has one event object for all its observers.

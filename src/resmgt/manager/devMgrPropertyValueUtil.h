@@ -10,7 +10,7 @@ namespace Orv {
 /// Reads and writes properties of the type @p T by property strings; no value is ever converted.
 ///
 /// - Threads: any.
-/// - Errors: what DevMgrPropertyAcc::getProperty(), DevMDProperty::get() and set() throw;
+/// - Errors: what DevMgrPropertyAcc::getProperty() and the operations of DevMDProperty throw;
 ///   DevMgrEx::PropertyInvalidType if the property is of another type.
 template <DevMDValue T>
 class ORV_HEADER_API DevMgrPropertyValueUtil {
@@ -29,6 +29,18 @@ public:
 
     static void setValue(DevMgrPropertyAcc& acc, const LiString& propertyString, const T& value) {
         resolve(acc, propertyString)->set(value);
+    }
+
+    /// Returns when the device has taken the value, or throws what the device throws.
+    static void setValueAndWait(DevMgrPropertyAcc& acc, const LiString& propertyString,
+                                const T& value) {
+        resolve(acc, propertyString)->setAndWait(value);
+    }
+
+    /// Gives up after @p seconds, not counting the opening of a device.
+    static void setValueAndWait(DevMgrPropertyAcc& acc, const LiString& propertyString,
+                                const T& value, double seconds) {
+        resolve(acc, propertyString)->setAndWait(value, seconds);
     }
 
     /// The property as its type, for many calls.

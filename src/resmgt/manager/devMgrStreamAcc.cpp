@@ -5,9 +5,8 @@
 
 #include "assertions.h"
 #include "devMDStreamPrtcl.h"
-#include "devMDStreamSink.h"
-#include "devMDStreamSource.h"
 #include "devMgrEx.h"
+#include "devMgrStreamLinkPrivate.h"
 #include "devMgrStreamParser.h"
 #include "rcExUtil.h"
 
@@ -15,84 +14,7 @@ namespace Orv {
 
 namespace {
 
-/// The end as a @p T, which its kind must be.
-template <class T>
-RCShdPtr<T> as(const RCShdPtr<DevMDStream>& end) {
-    RCShdPtr<T> result = RCShdPtr<T>::dynamicCast(end);
-    if (result.isNull()) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
-    return result;
-}
-
-/// Calls every action, whatever some of them throw.
-template <class... Actions>
-void performAll(Actions... actions) noexcept {
-    const auto perform = [](auto action) {
-        try {
-            action();
-        } catch (...) {
-            Assertions::traceCurrentException("disconnecting a stream");
-        }
-    };
-    (perform(actions), ...);
-}
-
-/// Two connected ends, whichever of them is the active one.
-struct Link {
-    DevMgrStreamParser parsed;
-    LiString configString;
-    RCShdPtr<DevMDStream> source;
-    RCShdPtr<DevMDStream> sink;
-
-    bool isPush() const { return parsed.getVerb() == DevMgrStreamParser::PUSH; }
-    const RCShdPtr<DevMDStream>& getActive() const { return isPush() ? source : sink; }
-    const RCShdPtr<DevMDStream>& getPassive() const { return isPush() ? sink : source; }
-
-    void checkKinds() const {
-        as<DevMDStreamSource>(source);
-        as<DevMDStreamSink>(sink);
-    }
-
-    void start() const {
-        if (isPush()) {
-            startEnds(*as<DevMDStreamActiveSource>(source), as<DevMDStreamPassiveSink>(sink));
-        } else {
-            startEnds(*as<DevMDStreamActiveSink>(sink), as<DevMDStreamPassiveSource>(source));
-        }
-    }
-
-    /// The passive end is stopped when nothing can reach it any more, a blocked pull ended first.
-    void stop() const noexcept {
-        DevMDStream& active = *getActive();
-        DevMDStream& passive = *getPassive();
-        const auto stopPassive = [&] { passive.stop(); };
-        const auto stopActive = [&] { active.stop(); };
-        if (isPush()) {
-            auto& end = dynamic_cast<DevMDStreamActiveSource&>(active);
-            performAll(stopActive, [&] { end.disconnect(); }, stopPassive);
-        } else {
-            auto& end = dynamic_cast<DevMDStreamActiveSink&>(active);
-            performAll(stopActive, stopPassive, [&] { end.disconnect(); });
-        }
-    }
-
-private:
-    template <class Active, class Passive>
-    static void startEnds(Active& active, const RCShdPtr<Passive>& passive) {
-        active.connect(passive);
-        try {
-            passive->start();
-            try {
-                active.start();
-            } catch (...) {
-                performAll([&] { passive->stop(); });
-                throw;
-            }
-        } catch (...) {
-            performAll([&] { active.disconnect(); });
-            throw;
-        }
-    }
-};
+using Link = RCShdPtr<DevMgrStreamLink>;
 
 class StreamAccImp : public DevMgrStreamAcc {
 public:
@@ -106,10 +28,11 @@ public:
             const LkGuard guard(_mediator->getConfigLock());
             links.swap(_links);
         }
-        for (const Link& link : links) link.stop();
+        for (const Link& link : links) link->stop();
     }
 
-    void connect(const LiString& configString) override;
+    void connect(const LiString& configString) override { connect(configString, nullptr); }
+    void connect(const LiString& configString, Ended ended) override;
     void disconnect(const LiString& configString) override;
     std::vector<Connection> getConnections() const override;
     void registerStream(const LiString& name, RCShdPtr<DevMDStream> stream) override;
@@ -121,49 +44,56 @@ private:
     DevNameMap<RCShdPtr<DevMDStream>> _ends;
     std::vector<Link> _links;
 
+    Link makeLink(const LiString& configString, Ended ended);
     RCShdPtr<DevMDStream> getEnd(const LiString& device, const LiString& stream);
     RCShdPtr<DevMDStream> findInDevice(const LiString& device, const LiString& stream);
-    void reserveEnds(const Link& link);
+    void reserveEnds(const DevMgrStreamLink& link);
     bool isRegisteredNoGuard(const StreamId& id) const { return _ends.find(id.getId()) != nullptr; }
 };
 
-void StreamAccImp::connect(const LiString& configString) {
+void StreamAccImp::connect(const LiString& configString, Ended ended) {
+    makeLink(configString, std::move(ended))->listen();
+}
+
+Link StreamAccImp::makeLink(const LiString& configString, Ended ended) {
     const DevMgrStreamParser parsed(configString);
     const StreamId sourceStreamId(parsed.getSourceDevice(), parsed.getSourceStream());
     const StreamId sinkStreamId(parsed.getSinkDevice(), parsed.getSinkStream());
-    Link link{parsed, configString, nullptr, nullptr};
-    link.source = getEnd(parsed.getSourceDevice(), parsed.getSourceStream());
-    link.sink = getEnd(parsed.getSinkDevice(), parsed.getSinkStream());
+    const RCShdPtr<DevMDStream> source = getEnd(parsed.getSourceDevice(), parsed.getSourceStream());
+    const RCShdPtr<DevMDStream> sink = getEnd(parsed.getSinkDevice(), parsed.getSinkStream());
+    Link link(new DevMgrStreamLink(_mediator->getFifo(), parsed, configString, source, sink,
+                                   std::move(ended)));
     {
         const LkGuard guard(_mediator->getConfigLock());
         ORV_ASSERT_TEXT(isRegisteredNoGuard(sourceStreamId),
                         "isRegisteredNoGuard( sourceStreamId )");
         ORV_ASSERT_TEXT(isRegisteredNoGuard(sinkStreamId), "isRegisteredNoGuard( sinkStreamId )");
         _links.reserve(_links.size() + 1);
-        reserveEnds(link);
+        reserveEnds(*link);
     }
     // The ends are started with the lock free: what devices do then may need it.
     struct Reservation {
         DevMgrMediator& mediator;
-        const Link& link;
+        const DevMgrStreamLink& link;
         ~Reservation() {
             const LkGuard guard(mediator.getConfigLock());
             mediator.release(*link.source);
             mediator.release(*link.sink);
         }
-    } const reservation{*_mediator, link};
-    link.checkKinds();
-    if (!link.sink->isCompatible(link.source->getDescription())) {
+    } const reservation{*_mediator, *link};
+    link->checkKinds();
+    if (!sink->isCompatible(source->getDescription())) {
         throw DevMgrEx::StreamsNotCompatible(ORV_FILE, __LINE__, configString.getChars());
     }
-    link.start();
+    link->start();
     try {
         const LkGuard guard(_mediator->getConfigLock());
         _links.push_back(link);
     } catch (...) {
-        link.stop();
+        link->stop();
         throw;
     }
+    return link;
 }
 
 /// The end of that name; what lies in a device is registered when it is first named.
@@ -173,7 +103,7 @@ RCShdPtr<DevMDStream> StreamAccImp::getEnd(const LiString& device, const LiStrin
         const LkGuard guard(_mediator->getConfigLock());
         if (const RCShdPtr<DevMDStream>* const found = _ends.find(id.getId())) return *found;
     }
-    if (device.isEmpty()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    if (device.isEmpty()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, id.getId());
     const RCShdPtr<DevMDStream> end = findInDevice(device, stream);
     const LkGuard guard(_mediator->getConfigLock());
     _ends.insert(id.getId(), end);
@@ -183,14 +113,14 @@ RCShdPtr<DevMDStream> StreamAccImp::getEnd(const LiString& device, const LiStrin
 RCShdPtr<DevMDStream> StreamAccImp::findInDevice(const LiString& device, const LiString& stream) {
     const RCShdPtr<DevMDPrtcl> prtcl = _mediator->getPrtcl(device);
     auto* const streams = dynamic_cast<DevMDStreamPrtcl*>(prtcl.get());
-    if (streams == nullptr) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
+    if (streams == nullptr) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__, device);
     for (auto iter = streams->performGetStreams(); !iter.atEnd(); iter.next()) {
         if (iter.item()->getName() == stream) return iter.item();
     }
-    throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, StreamId(device, stream).getId());
 }
 
-void StreamAccImp::reserveEnds(const Link& link) {
+void StreamAccImp::reserveEnds(const DevMgrStreamLink& link) {
     const StreamId id(link.parsed.getSourceDevice(), link.parsed.getSourceStream());
     const auto refuse = [&] {
         throw DevMgrEx::StreamNotAvailable(ORV_FILE, __LINE__, id.getId().getChars());
@@ -203,34 +133,25 @@ void StreamAccImp::reserveEnds(const Link& link) {
 
 void StreamAccImp::disconnect(const LiString& configString) {
     const DevMgrStreamParser parsed(configString);
-    const auto idOf = [](const LiString& device, const LiString& stream) {
-        return StreamId(device, stream).getId();
-    };
-    const auto isMeant = [&](const Link& link) {
-        return link.parsed.getVerb() == parsed.getVerb() &&
-               idOf(link.parsed.getSourceDevice(), link.parsed.getSourceStream()) ==
-                   idOf(parsed.getSourceDevice(), parsed.getSourceStream()) &&
-               idOf(link.parsed.getSinkDevice(), link.parsed.getSinkStream()) ==
-                   idOf(parsed.getSinkDevice(), parsed.getSinkStream());
-    };
-    std::vector<Link> found;
+    Link found;
     {
         const LkGuard guard(_mediator->getConfigLock());
-        const auto link = std::find_if(_links.begin(), _links.end(), isMeant);
-        if (link == _links.end()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
-        found.push_back(*link);
+        const auto link = std::find_if(_links.begin(), _links.end(),
+                                       [&](const Link& item) { return item->isSame(parsed); });
+        if (link == _links.end()) {
+            throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, configString);
+        }
+        found = *link;
         _links.erase(link);
     }
-    found.front().stop();
+    found->stop();
 }
 
 std::vector<DevMgrStreamAcc::Connection> StreamAccImp::getConnections() const {
     std::vector<Connection> result;
     const LkGuard guard(_mediator->getConfigLock());
     result.reserve(_links.size());
-    for (const Link& link : _links) {
-        result.push_back({link.configString, link.getActive()->getState()});
-    }
+    for (const Link& link : _links) result.push_back(link->getConnection());
     return result;
 }
 
@@ -238,7 +159,7 @@ void StreamAccImp::registerStream(const LiString& name, RCShdPtr<DevMDStream> st
     if (stream.isNull()) RCExUtil::throwExNullPtr();
     const LkGuard guard(_mediator->getConfigLock());
     if (!_ends.insert(StreamId(LiString(), name).getId(), std::move(stream))) {
-        throw DevMgrEx::NameNotUnique(ORV_FILE, __LINE__);
+        throw DevMgrEx::NameNotUnique(ORV_FILE, __LINE__, StreamId(LiString(), name).getId());
     }
 }
 
@@ -247,9 +168,9 @@ void StreamAccImp::deregisterStream(const LiString& name) {
     RCShdPtr<DevMDStream> stream;
     const LkGuard guard(_mediator->getConfigLock());
     if (const RCShdPtr<DevMDStream>* const found = _ends.find(id.getId())) stream = *found;
-    if (stream.isNull()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    if (stream.isNull()) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, id.getId());
     const bool isConnected = std::any_of(_links.begin(), _links.end(), [&](const Link& link) {
-        return link.source == stream || link.sink == stream;
+        return link->source == stream || link->sink == stream;
     });
     if (isConnected) {
         throw DevMgrEx::StreamNotAvailable(ORV_FILE, __LINE__, id.getId().getChars());

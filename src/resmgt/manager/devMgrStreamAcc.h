@@ -1,5 +1,7 @@
 #pragma once
 
+#include <exception>
+#include <functional>
 #include <vector>
 
 #include "devMDStream.h"
@@ -31,8 +33,14 @@ public:
 
     struct Connection {
         LiString configString;
-        DevMDStream::State state;  ///< RUNNING, ENDED or FAILED, as the active end knows.
+        DevMDStream::State state;    ///< RUNNING, ENDED or FAILED, as far as the ends know.
+        std::exception_ptr failure;  ///< What it failed with, if that is known; else null.
     };
+
+    /// Hears that a connection has ENDED, its source having delivered everything, or FAILED; and of
+    /// the one after the other, if a sink fails at what came last. Called on the manager's thread;
+    /// it may disconnect and connect. What it throws is traced.
+    using Ended = std::function<void(const Connection&)>;
 
     static ObjPtrRet<DevMgrStreamAcc> create(RCShdPtr<DevMgrMediator> mediator);
     virtual ~DevMgrStreamAcc();
@@ -44,7 +52,8 @@ public:
     ///   DevMgrEx::BadMDPrtclImp if an end is of the wrong kind.
     virtual void connect(const LiString& configString) = 0;
 
-    /// Returns when nothing flows any more.
+    /// Returns when nothing flows any more and nobody is being told of it; on the manager's thread
+    /// the one who is runs on.
     /// @throws DevMgrEx::ConfigSyntaxError; DevMgrEx::NameNotRegistered if it is not connected.
     virtual void disconnect(const LiString& configString) = 0;
 
@@ -56,6 +65,9 @@ public:
 
     /// @throws DevMgrEx::NameNotRegistered; DevMgrEx::StreamNotAvailable if it is connected.
     virtual void deregisterStream(const LiString& name) = 0;
+
+    /// Like connect(configString), with somebody who is told how it ends.
+    virtual void connect(const LiString& configString, Ended ended) = 0;
 };
 
 }  // namespace Orv

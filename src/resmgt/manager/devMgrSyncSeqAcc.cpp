@@ -59,6 +59,7 @@ private:
 
     void createNode(const LiString& name);
     DevSeqTreeNode& getNode(const LiString& name) const;
+    LiString findFailed() const;
     void execute(const DevSeqCommand& command) {
         _tree->execute(command, _mediator->isManagerThread() ? DevSeqTree::Where::AT_ONCE
                                                              : DevSeqTree::Where::IN_QUEUE);
@@ -81,7 +82,7 @@ void SyncSeqAccImp::configure(const LiString& treeString) {
 /// Opening the device leaves the lock free, as it may take long and may need the manager.
 void SyncSeqAccImp::createNode(const LiString& name) {
     const auto prtcl = RCShdPtr<DevMDSyncSeqPrtcl>::dynamicCast(_mediator->getPrtcl(name));
-    if (prtcl.isNull()) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__);
+    if (prtcl.isNull()) throw DevMgrEx::BadMDPrtclImp(ORV_FILE, __LINE__, name);
     const LkGuard guard(_mediator->getConfigLock());
     ORV_ASSERT_TEXT(_seqTreeNodeMap.find(name) == nullptr, "iter == _seqTreeNodeMap.end()");
     ORV_ASSERT_TEXT(_mediator->isPrtclCreated(name), "_mediator->isPrtclCreated( name )");
@@ -91,7 +92,7 @@ void SyncSeqAccImp::createNode(const LiString& name) {
 DevSeqTreeNode& SyncSeqAccImp::getNode(const LiString& name) const {
     const LkGuard guard(_mediator->getConfigLock());
     DevSeqTreeNode* const* const found = _seqTreeNodeMap.find(name);
-    if (found == nullptr) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__);
+    if (found == nullptr) throw DevMgrEx::NameNotRegistered(ORV_FILE, __LINE__, name);
     return **found;
 }
 
@@ -100,7 +101,20 @@ bool SyncSeqAccImp::waitFor(const LiString& state, double seconds) {
     if (index < 0 || index > static_cast<int>(DevSeqState::FINAL)) {
         throw DevMgrEx::SMDomainError(ORV_FILE, __LINE__);
     }
-    return _tree->getBoard().waitFor(static_cast<DevSeqState>(index), seconds);
+    try {
+        return _tree->getBoard().waitFor(static_cast<DevSeqState>(index), seconds);
+    } catch (const DevMgrEx::SMExecutionError&) {
+        throw DevMgrEx::SMExecutionError(ORV_FILE, __LINE__, findFailed());
+    }
+}
+
+/// The first device that has failed; empty if none has.
+LiString SyncSeqAccImp::findFailed() const {
+    const LkGuard guard(_mediator->getConfigLock());
+    for (const auto& [name, node] : _seqTreeNodeMap) {
+        if (!_tree->getBoard().getFailure(node->getIndex()).isEmpty()) return name;
+    }
+    return LiString();
 }
 
 }  // namespace

@@ -57,8 +57,9 @@ public:
 
     /// Waits until all devices stand in the state together, and be it for a moment.
     /// @return false if the time ran out.
-    /// @throws DevMgrEx::SMExecutionError if that cannot come any more, as a device has failed or
-    ///   ended elsewhere, and on the manager's thread; DevMgrEx::SMDomainError for no state.
+    /// @throws DevMgrEx::SMExecutionError if that cannot come any more, as a device, the error's
+    ///   subject, has failed or one has ended elsewhere, and on the manager's thread;
+    ///   DevMgrEx::SMDomainError for no state.
     [[nodiscard]] virtual bool waitFor(const LiString& state, double seconds) = 0;
 
     /// From the last command to get into step until the device was, and when that was; zero before.

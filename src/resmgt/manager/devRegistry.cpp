@@ -28,7 +28,7 @@ class DevRegistryImp : public DevRegistry {
 public:
     void addEntry(ObjPtr<DevRegistryEntry> entry) override {
         const LiString name = entry->getName();
-        if (isRegistered(name)) throw DevPrtclEx::ExNameNotUnique(ORV_FILE, __LINE__);
+        if (isRegistered(name)) throw DevPrtclEx::ExNameNotUnique(ORV_FILE, __LINE__, name);
         _entries.insert(name, std::move(entry));
     }
 
@@ -60,7 +60,9 @@ private:
     DevNameMap<ObjPtr<DevRegistryEntry>> _entries;
 
     ObjPtr<DevRegistryEntry>& getEntry(const LiString& name) {
-        if (!isRegistered(name)) throw DevPrtclEx::ExNameNotRegistered(ORV_FILE, __LINE__);
+        if (!isRegistered(name)) {
+            throw DevPrtclEx::ExNameNotRegistered(ORV_FILE, __LINE__, name);
+        }
         return *_entries.find(name);
     }
 };

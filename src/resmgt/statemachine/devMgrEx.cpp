@@ -10,8 +10,8 @@ const char* orElse(const char* text, const char* otherwise) {
 
 }  // namespace
 
-DevMgrEx::DevMgrEx(const char* file, int line, const char* reason)
-    : ExBase(file, line), std::logic_error("") {
+DevMgrEx::DevMgrEx(const char* file, int line, const char* reason, const LiString& subject)
+    : ExBase(file, line), std::logic_error(""), _subject(subject) {
     setReason(reason);
 }
 
@@ -19,23 +19,23 @@ const char* DevMgrEx::what() const noexcept {
     return getReason();
 }
 
-DevMgrEx::NameNotUnique::NameNotUnique(const char* file, int line)
-    : ExConcrete(file, line, "Not a unique name.") {}
+DevMgrEx::NameNotUnique::NameNotUnique(const char* file, int line, const LiString& subject)
+    : ExConcrete(file, line, "Not a unique name.", subject) {}
 
-DevMgrEx::NameNotRegistered::NameNotRegistered(const char* file, int line)
-    : ExConcrete(file, line, "Not a registered object.") {}
+DevMgrEx::NameNotRegistered::NameNotRegistered(const char* file, int line, const LiString& subject)
+    : ExConcrete(file, line, "Not a registered object.", subject) {}
 
-DevMgrEx::NameNotFound::NameNotFound(const char* file, int line)
-    : ExConcrete(file, line, "Named device not found.") {}
+DevMgrEx::NameNotFound::NameNotFound(const char* file, int line, const LiString& subject)
+    : ExConcrete(file, line, "Named device not found.", subject) {}
 
 DevMgrEx::ConfigSyntaxError::ConfigSyntaxError(const char* file, int line, const char* text)
     : ExConcrete(file, line, orElse(text, "Configuration string Syntax error.")) {}
 
-DevMgrEx::BadMDPrtclImp::BadMDPrtclImp(const char* file, int line)
-    : ExConcrete(file, line, "Managed device protocol not implemented.") {}
+DevMgrEx::BadMDPrtclImp::BadMDPrtclImp(const char* file, int line, const LiString& subject)
+    : ExConcrete(file, line, "Managed device protocol not implemented.", subject) {}
 
-DevMgrEx::SMExecutionError::SMExecutionError(const char* file, int line)
-    : ExConcrete(file, line, "State machine error condition.") {}
+DevMgrEx::SMExecutionError::SMExecutionError(const char* file, int line, const LiString& subject)
+    : ExConcrete(file, line, "State machine error condition.", subject) {}
 
 DevMgrEx::SMDomainError::SMDomainError(const char* file, int line)
     : ExConcrete(file, line, "State machine domain error.") {}

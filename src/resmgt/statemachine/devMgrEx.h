@@ -3,6 +3,7 @@
 #include <stdexcept>
 
 #include "exBase.h"
+#include "liString.h"
 #include "resmgtApi.h"
 
 namespace Orv {
@@ -27,26 +28,33 @@ public:
 
     const char* what() const noexcept override;
 
+    /// What it is about, where the reason does not say: a device, "mixer:eq:gain", a node. Else
+    /// empty.
+    const LiString& getSubject() const noexcept { return _subject; }
+
 protected:
-    DevMgrEx(const char* file, int line, const char* reason);
+    DevMgrEx(const char* file, int line, const char* reason, const LiString& subject = LiString());
+
+private:
+    LiString _subject;
 };
 
 /// "Not a unique name."
 class ORV_RESMGT_API DevMgrEx::NameNotUnique : public ExConcrete<NameNotUnique, DevMgrEx> {
 public:
-    NameNotUnique(const char* file, int line);
+    NameNotUnique(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// A property, stream, observer or stream end that is not known: "Not a registered object."
 class ORV_RESMGT_API DevMgrEx::NameNotRegistered : public ExConcrete<NameNotRegistered, DevMgrEx> {
 public:
-    NameNotRegistered(const char* file, int line);
+    NameNotRegistered(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// "Named device not found."
 class ORV_RESMGT_API DevMgrEx::NameNotFound : public ExConcrete<NameNotFound, DevMgrEx> {
 public:
-    NameNotFound(const char* file, int line);
+    NameNotFound(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// A configuration string that does not parse.
@@ -60,13 +68,13 @@ public:
 /// implemented."
 class ORV_RESMGT_API DevMgrEx::BadMDPrtclImp : public ExConcrete<BadMDPrtclImp, DevMgrEx> {
 public:
-    BadMDPrtclImp(const char* file, int line);
+    BadMDPrtclImp(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// "State machine error condition."
 class ORV_RESMGT_API DevMgrEx::SMExecutionError : public ExConcrete<SMExecutionError, DevMgrEx> {
 public:
-    SMExecutionError(const char* file, int line);
+    SMExecutionError(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// "State machine domain error."

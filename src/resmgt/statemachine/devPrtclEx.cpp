@@ -10,8 +10,8 @@ const char* orUnknown(const char* name) {
 
 }  // namespace
 
-DevPrtclEx::DevPrtclEx(const char* file, int line, const char* reason)
-    : ExBase(file, line), std::logic_error("") {
+DevPrtclEx::DevPrtclEx(const char* file, int line, const char* reason, const LiString& subject)
+    : ExBase(file, line), std::logic_error(""), _subject(subject) {
     setReason(reason);
 }
 
@@ -19,11 +19,12 @@ const char* DevPrtclEx::what() const noexcept {
     return getReason();
 }
 
-DevPrtclEx::ExNameNotUnique::ExNameNotUnique(const char* file, int line)
-    : ExConcrete(file, line, "Not a unique name.") {}
+DevPrtclEx::ExNameNotUnique::ExNameNotUnique(const char* file, int line, const LiString& subject)
+    : ExConcrete(file, line, "Not a unique name.", subject) {}
 
-DevPrtclEx::ExNameNotRegistered::ExNameNotRegistered(const char* file, int line)
-    : ExConcrete(file, line, "Device name not found in the registry.") {}
+DevPrtclEx::ExNameNotRegistered::ExNameNotRegistered(const char* file, int line,
+                                                     const LiString& subject)
+    : ExConcrete(file, line, "Device name not found in the registry.", subject) {}
 
 DevPrtclEx::ExMDStdAddStream::ExMDStdAddStream(const char* file, int line)
     : ExConcrete(file, line, "Attempt to add stream after iterator created.") {}
@@ -70,6 +71,11 @@ DevPrtclEx::ExMDStdPropertiesWriteUnavail::ExMDStdPropertiesWriteUnavail(const c
 
 DevPrtclEx::ExMDStdPropertyGet::ExMDStdPropertyGet(const char* file, int line, const char* property)
     : ExConcrete(file, line, "Error while getting the value for ") {
+    appendReason(orUnknown(property));
+}
+
+DevPrtclEx::ExMDStdPropertySet::ExMDStdPropertySet(const char* file, int line, const char* property)
+    : ExConcrete(file, line, "Error while setting the value for ") {
     appendReason(orUnknown(property));
 }
 

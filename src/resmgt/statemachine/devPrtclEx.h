@@ -3,6 +3,7 @@
 #include <stdexcept>
 
 #include "exBase.h"
+#include "liString.h"
 #include "resmgtApi.h"
 
 namespace Orv {
@@ -18,26 +19,34 @@ public:
     class ExMDStdPropertiesReadUnavail;
     class ExMDStdPropertiesWriteUnavail;
     class ExMDStdPropertyGet;
+    class ExMDStdPropertySet;
     class ExMDStdPropertySetBuilderPop;
     class ExMDStdFifoClosed;
 
     const char* what() const noexcept override;
 
+    /// What it is about, where the reason does not say: a device or a property. Else empty.
+    const LiString& getSubject() const noexcept { return _subject; }
+
 protected:
-    DevPrtclEx(const char* file, int line, const char* reason);
+    DevPrtclEx(const char* file, int line, const char* reason,
+               const LiString& subject = LiString());
+
+private:
+    LiString _subject;
 };
 
 /// "Not a unique name."
 class ORV_RESMGT_API DevPrtclEx::ExNameNotUnique : public ExConcrete<ExNameNotUnique, DevPrtclEx> {
 public:
-    ExNameNotUnique(const char* file, int line);
+    ExNameNotUnique(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// "Device name not found in the registry."
 class ORV_RESMGT_API DevPrtclEx::ExNameNotRegistered
     : public ExConcrete<ExNameNotRegistered, DevPrtclEx> {
 public:
-    ExNameNotRegistered(const char* file, int line);
+    ExNameNotRegistered(const char* file, int line, const LiString& subject = LiString());
 };
 
 /// "Attempt to add stream after iterator created."
@@ -85,6 +94,14 @@ class ORV_RESMGT_API DevPrtclEx::ExMDStdPropertyGet
 public:
     /// @param property  null: "<unknown>"
     ExMDStdPropertyGet(const char* file, int line, const char* property);
+};
+
+/// A device has not taken a value, as far as is known: "Error while setting the value for <name>".
+class ORV_RESMGT_API DevPrtclEx::ExMDStdPropertySet
+    : public ExConcrete<ExMDStdPropertySet, DevPrtclEx> {
+public:
+    /// @param property  null: "<unknown>"
+    ExMDStdPropertySet(const char* file, int line, const char* property);
 };
 
 /// "Trying to pop the builder's property stack when it is empty."

@@ -1,0 +1,59 @@
+#include "devMDStdStreamActiveSource.h"
+
+#include <utility>
+
+#include "assertions.h"
+#include "devMDStdStreamNewsPrivate.h"
+
+namespace Orv {
+
+using Elem = DevMDStreamElem;
+
+DevMDStdStreamActiveSource::DevMDStdStreamActiveSource(const LiString& name,
+                                                       const LiString& description)
+    : _name(name), _description(description) {}
+
+DevMDStdStreamActiveSource::~DevMDStdStreamActiveSource() noexcept(false) = default;
+
+void DevMDStdStreamActiveSource::start() {
+    _isAvailable = false;
+    _end.start();
+}
+
+void DevMDStdStreamActiveSource::stop() {
+    _end.stop();
+    _isAvailable = true;
+}
+
+bool DevMDStdStreamActiveSource::push(ObjPtr<Elem> elem) {
+    return pushAndJudge(std::move(elem), nullptr);
+}
+
+void DevMDStdStreamActiveSource::fail(std::exception_ptr failure) {
+    pushAndJudge(DevMDStdStreamNews::create(Elem::FAILED), std::move(failure));
+}
+
+bool DevMDStdStreamActiveSource::pushAndJudge(ObjPtr<Elem> elem, std::exception_ptr failure) {
+    const State state = DevMDStdStreamNews::stateAfter(elem->getEv());
+    {
+        const DevMDStdStreamActiveEnd<DevMDStreamPassiveSink>::Use sink(_end);
+        if (!sink.isPossible()) return false;
+        if (state != State::RUNNING) _end.end(state, std::move(failure));
+        try {
+            sink->push(std::move(elem));
+        } catch (...) {
+            // A sink that has failed has told why.
+            if (sink->getState() != State::FAILED) {
+                Assertions::traceCurrentException(
+                    DevMDStdStreamNews::describe("pushing into", _name).c_str());
+            }
+            _end.end(State::FAILED, std::current_exception());
+        }
+    }
+    const State after = _end.getState();
+    if (after == State::RUNNING) return true;
+    _end.tellEnd();
+    return false;
+}
+
+}  // namespace Orv
