@@ -23,12 +23,13 @@ constexpr std::int64_t NB_PICTURES_ON_THEIR_WAY_REVERSE = 4;
 
 SourceDevice::SourceDevice(const Orv::LiString& name, HostContext& context)
     : MediaDevice(name, context) {
-    addProperties();
+    addPictureProperties();
+    addSoundProperties();
 }
 
 SourceDevice::~SourceDevice() noexcept(false) = default;
 
-void SourceDevice::addProperties() {
+void SourceDevice::addPictureProperties() {
     using Descriptor = Orv::DevMDPropertyDescriptor<std::int64_t>;
     const auto number = Descriptor::create();
     number->setUnit("pictures").setRange(0, INT64_MAX);
@@ -51,9 +52,6 @@ void SourceDevice::addProperties() {
     addProperty<std::int64_t>("video:faults", "damaged pieces left out", [this] {
         return static_cast<std::int64_t>(_pictures ? _pictures->getNbFaults() : 0);
     });
-    addProperty<std::int64_t>("audio:faults", "damaged pieces left out", [this] {
-        return static_cast<std::int64_t>(_sound ? _sound->getNbFaults() : 0);
-    });
     addProperty<int>("video:width", "of the pictures; 0: there are none",
                      [this] { return _pictureFormat ? _pictureFormat->width : 0; });
     addProperty<int>("video:height", "of the pictures; 0: there are none",
@@ -65,6 +63,12 @@ void SourceDevice::addProperties() {
         [this] { return _pictureFormat ? _pictureFormat->rate.toDouble() : 0; }, nullptr, rate);
     addProperty<TextValue>("format", "how the pictures lie in memory", [this] {
         return toTextValue(_pictureFormat ? _pictureFormat->pixelName : "none");
+    });
+}
+
+void SourceDevice::addSoundProperties() {
+    addProperty<std::int64_t>("audio:faults", "damaged pieces left out", [this] {
+        return static_cast<std::int64_t>(_sound ? _sound->getNbFaults() : 0);
     });
     const auto hertz = Orv::DevMDPropertyDescriptor<int>::create();
     hertz->setUnit("Hz");

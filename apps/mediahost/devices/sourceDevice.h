@@ -54,7 +54,8 @@ private:
     int _nbExpected = -1;  // loops that are connected; -1 before the start
 
     void halt();
-    void addProperties();
+    void addPictureProperties();
+    void addSoundProperties();
     void notePrepared();
     void play(Loop& loop, Track& track, std::int64_t nbAhead, bool mayDrop, const Push& push);
     bool playOnce(Loop& loop, Track& track, std::int64_t nbAhead, bool mayDrop, const Push& push,
