@@ -13,11 +13,6 @@ ReaderDevice::ReaderDevice(const Orv::LiString& name, HostContext& context, Sett
 }
 
 void ReaderDevice::addFileProperties() {
-    const auto seconds = Orv::DevMDPropertyDescriptor<double>::create();
-    seconds->setUnit("s");
-    addProperty<double>(
-        "duration", "as the file says; 0: it does not", [this] { return _seconds; }, nullptr,
-        seconds);
     addProperty<TextValue>("file", "what is read", [this] { return toTextValue(_file); });
     addProperty<TextValue>("codecs", "what decodes it", [this] { return toTextValue(_codecs); });
     addProperty<int>("threads", "that decode pictures; 0: one per processor",

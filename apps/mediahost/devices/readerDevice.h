@@ -16,7 +16,6 @@ public:
 
 private:
     std::string _file;
-    double _seconds = 0;
     std::int64_t _nbThreads = 0;
     std::string _codecs;
 

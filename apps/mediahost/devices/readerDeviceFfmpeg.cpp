@@ -39,20 +39,22 @@ void ReaderDevice::openFile() {
     if (!pictures && !sound) {
         throw MediaError('"' + _file + "\" has neither pictures nor sound");
     }
+    double seconds = 0;
     if (pictures) {
         auto decoder = std::make_unique<FfmpegPictures>(std::move(pictures));
         const PictureFormat format = decoder->getFormat();
-        _seconds = decoder->getSeconds();
+        seconds = decoder->getSeconds();
         _codecs = decoder->getCodecName();
         addPictures(std::move(decoder), format);
     }
     if (sound) {
         auto decoder = std::make_unique<FfmpegSound>(std::move(sound));
         const SoundFormat format = decoder->getFormat();
-        _seconds = std::max(_seconds, decoder->getSeconds());
+        seconds = std::max(seconds, decoder->getSeconds());
         _codecs += (_codecs.empty() ? "" : ", ") + decoder->getCodecName();
         addSound(std::move(decoder), format);
     }
+    setDuration(seconds);
 }
 
 }  // namespace MediaHost

@@ -20,6 +20,7 @@ PatternDevice::PatternDevice(const Orv::LiString& name, HostContext& context, Se
     const Orv::Rational rate = settings.getRate("rate", context.timecode->getEditRate());
     const double seconds = settings.getReal("seconds", STANDARD_SECONDS, 0, MOST_SECONDS);
     settings.check();
+    setDuration(seconds);
     auto decoder = std::make_unique<PatternPictures>(
         width, height, rate, std::llround(seconds * rate.toDouble()), context.timecode);
     const PictureFormat format = decoder->getFormat();
@@ -32,6 +33,7 @@ ToneDevice::ToneDevice(const Orv::LiString& name, HostContext& context, Settings
     const double hertz = settings.getReal("hertz", 440, 1, 20000);
     const double seconds = settings.getReal("seconds", STANDARD_SECONDS, 0, MOST_SECONDS);
     settings.check();
+    setDuration(seconds);
     auto decoder = std::make_unique<ToneSound>(rate, hertz, std::llround(seconds * rate));
     const SoundFormat format = decoder->getFormat();
     addSound(std::move(decoder), format);

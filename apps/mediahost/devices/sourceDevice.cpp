@@ -23,12 +23,13 @@ constexpr std::int64_t NB_PICTURES_ON_THEIR_WAY_REVERSE = 4;
 
 SourceDevice::SourceDevice(const Orv::LiString& name, HostContext& context)
     : MediaDevice(name, context) {
-    addProperties();
+    addPictureProperties();
+    addSoundProperties();
 }
 
 SourceDevice::~SourceDevice() noexcept(false) = default;
 
-void SourceDevice::addProperties() {
+void SourceDevice::addPictureProperties() {
     using Descriptor = Orv::DevMDPropertyDescriptor<std::int64_t>;
     const auto number = Descriptor::create();
     number->setUnit("pictures").setRange(0, INT64_MAX);
@@ -36,6 +37,11 @@ void SourceDevice::addProperties() {
         "position", "number of the picture shown last; set: the one to go on with",
         [this] { return _position.load(); }, [this](const std::int64_t& unit) { _jump = unit; },
         number);
+    const auto seconds = Orv::DevMDPropertyDescriptor<double>::create();
+    seconds->setUnit("s");
+    addProperty<double>(
+        "duration", "of all of it, as far as that is known beforehand; else 0",
+        [this] { return _duration; }, nullptr, seconds);
     addProperty<std::int64_t>("video:shown", "pictures that were handed on",
                               [this] { return _nbShown.load(); });
     addProperty<std::int64_t>("video:dropped", "pictures that came too late to be handed on",
@@ -45,9 +51,6 @@ void SourceDevice::addProperties() {
         [this] { return static_cast<std::int64_t>(_pictures ? _pictures->getNbDecoded() : 0); });
     addProperty<std::int64_t>("video:faults", "damaged pieces left out", [this] {
         return static_cast<std::int64_t>(_pictures ? _pictures->getNbFaults() : 0);
-    });
-    addProperty<std::int64_t>("audio:faults", "damaged pieces left out", [this] {
-        return static_cast<std::int64_t>(_sound ? _sound->getNbFaults() : 0);
     });
     addProperty<int>("video:width", "of the pictures; 0: there are none",
                      [this] { return _pictureFormat ? _pictureFormat->width : 0; });
@@ -60,6 +63,12 @@ void SourceDevice::addProperties() {
         [this] { return _pictureFormat ? _pictureFormat->rate.toDouble() : 0; }, nullptr, rate);
     addProperty<TextValue>("format", "how the pictures lie in memory", [this] {
         return toTextValue(_pictureFormat ? _pictureFormat->pixelName : "none");
+    });
+}
+
+void SourceDevice::addSoundProperties() {
+    addProperty<std::int64_t>("audio:faults", "damaged pieces left out", [this] {
+        return static_cast<std::int64_t>(_sound ? _sound->getNbFaults() : 0);
     });
     const auto hertz = Orv::DevMDPropertyDescriptor<int>::create();
     hertz->setUnit("Hz");

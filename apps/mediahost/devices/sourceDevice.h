@@ -24,6 +24,7 @@ protected:
     // In the constructor, each at most once:
     void addPictures(std::unique_ptr<UnitDecoder> decoder, const PictureFormat& format);
     void addSound(std::unique_ptr<UnitDecoder> decoder, const SoundFormat& format);
+    void setDuration(double seconds) { _duration = seconds; }
 
     void start(const Orv::DevMDSyncSeqSignals& signals) override;
     void stop(Orv::DevMDSyncSeqRequest& request) override;
@@ -36,6 +37,7 @@ private:
 
     std::shared_ptr<const PictureFormat> _pictureFormat;
     std::optional<SoundFormat> _soundFormat;
+    double _duration = 0;  // seconds; 0: unknown
     std::unique_ptr<Track> _pictures, _sound;
     Orv::RCShdPtr<Loop> _pictureLoop, _soundLoop;
     Orv::RCShdPtr<Orv::DevMDStdProperty<std::int64_t>> _positionProperty;
@@ -52,7 +54,8 @@ private:
     int _nbExpected = -1;  // loops that are connected; -1 before the start
 
     void halt();
-    void addProperties();
+    void addPictureProperties();
+    void addSoundProperties();
     void notePrepared();
     void play(Loop& loop, Track& track, std::int64_t nbAhead, bool mayDrop, const Push& push);
     bool playOnce(Loop& loop, Track& track, std::int64_t nbAhead, bool mayDrop, const Push& push,
