@@ -33,7 +33,7 @@ protected:
     HostContext& getContext() const { return _context; }
 
     /// A sink whose buffers of the class @p Buf go to @p take. What that throws is the failure of
-    /// the device, which discards what still comes: the stream goes on, so that its end still comes.
+    /// the device, which then discards what still comes.
     template <class Buf, class Take>
     Orv::RCShdPtr<Sink> addInput(const Orv::LiString& name, const Orv::LiString& description,
                                  Take take);
