@@ -139,7 +139,9 @@ TEST_F(DevMDStdSyncSeq, canStopWhenItsInputsHaveEnded) {
     class Recorder : public DevMDStdSyncSeqDevice {
     public:
         Recorder() : DevMDStdSyncSeqDevice("recorder") {
-            input = addSink("input", "", [](const ObjPtr<DevMDStreamElem>&) {});
+            input = addSink("input", "", [](const ObjPtr<DevMDStreamElem>& elem) {
+                if (!elem->isTerminal()) throw std::runtime_error("the disk is full");
+            });
         }
         RCShdPtr<DevMDStdStreamPassiveSink> input;
         TestCounter nbStops, nbFinished;
@@ -162,9 +164,21 @@ TEST_F(DevMDStdSyncSeq, canStopWhenItsInputsHaveEnded) {
     recorder->input->stop();
     EXPECT_TRUE(outcome.run.waitFor(2));
     EXPECT_EQ(recorder->nbFinished.get(), 1) << "before the stop is done";
+    // One that has failed has ended once its source hears of it, whether disconnected or not.
+    DevMDStdStreamActiveSource source("video", "");
+    source.connect(recorder->input);
+    recorder->input->start();
+    source.start();
+    while (
+        source.push(ObjPtr<DevMDStreamElem>(new DevMDStreamElem(nullptr, DevMDStreamElem::GAP)))) {
+    }
+    recorder->performStop(countIn(outcome));
+    EXPECT_TRUE(outcome.run.waitFor(3));
+    source.disconnect();
+    recorder->input->stop();
     recorder->input->start();
     recorder->performStop(countIn(outcome));
-    recorder->nbStops.waitFor(3);
+    recorder->nbStops.waitFor(4);
     recorder->performClose();
     EXPECT_EQ(outcome.dropped.get(), 1) << "it would lead back to the device";
 }

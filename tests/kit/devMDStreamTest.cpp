@@ -131,7 +131,7 @@ TEST(DevMDStdStreamFunctionSink, whatItsFunctionThrowsEndsTheStreamAndIsTold) {
         EXPECT_EQ(sink->getState(), State::FREE);
     }
     device->performClose();
-    EXPECT_EQ(seen, (std::vector<int>{1, 2, -Elem::STOPPED, 1, 2, -Elem::STOPPED}));
+    EXPECT_EQ(seen, (std::vector<int>{1, 2, -Elem::FAILED, 1, 2, -Elem::FAILED}));
 }
 
 TEST(DevMDStdStreamFunctionSink, whatIsLeftOfAStreamDoesNotHarmTheNext) {

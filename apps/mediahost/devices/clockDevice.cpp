@@ -91,7 +91,6 @@ void ClockDevice::abort(Orv::DevMDSyncSeqRequest& request) {
 
 void ClockDevice::close() {
     endBeating();
-    MediaDevice::close();
 }
 
 }  // namespace MediaHost

@@ -84,7 +84,6 @@ void DisplayDevice::finish(bool isWhole) {
 
 void DisplayDevice::close() {
     _window.reset();
-    MediaDevice::close();
 }
 
 }  // namespace MediaHost

@@ -1,6 +1,6 @@
 #include "mediaDevice.h"
 
-#include <algorithm>
+#include <utility>
 
 namespace MediaHost {
 
@@ -26,28 +26,10 @@ Orv::RCShdPtr<MediaDevice::Source> MediaDevice::addOutput(const Orv::LiString& n
     return source;
 }
 
-bool MediaDevice::isInputOpen(std::size_t input) const {
-    return !_inputs[input].hasEnded &&
-           _inputs[input].sink->getState() != Orv::DevMDStream::State::FREE;
-}
-
-bool MediaDevice::isAnyInputOpen() const {
-    for (std::size_t i = 0; i < _inputs.size(); ++i) {
-        if (isInputOpen(i)) return true;
-    }
-    return false;
-}
-
-void MediaDevice::take(std::size_t input, Orv::ObjPtr<Elem> elem,
-                       const std::function<void(const Orv::RCShdPtr<Orv::DevMDStreamBuf>&)>& work) {
+void MediaDevice::take(const Orv::RCShdPtr<Orv::DevMDStreamBuf>& buf, const Work& work) {
+    if (_isFinished) return;
     try {
-        if (elem->isTerminal()) {
-            _inputs[input].hasEnded = true;
-            inputEnded(input);
-            if (!isAnyInputOpen()) finishOnce(!_context.hasFailed());
-        } else if (elem->getEv() == Elem::DATA && !_isFinished) {
-            work(elem->getBuf());
-        }
+        work(buf);
     } catch (...) {
         _context.reportFailure(_text, std::current_exception());
         finishOnce(false);
@@ -55,40 +37,32 @@ void MediaDevice::take(std::size_t input, Orv::ObjPtr<Elem> elem,
 }
 
 void MediaDevice::finishOnce(bool isWhole) {
-    if (!_isFinished) {
-        _isFinished = true;
-        finish(isWhole);
-    }
-    if (!isAnyInputOpen()) _stopping.done();
-    _context.reportEnd(_text);
-}
-
-void MediaDevice::start(const Orv::DevMDSyncSeqSignals& signals) {
-    if (isAnyInputOpen()) _context.expectEnd(_text);
-    signals.ready();
-}
-
-// What is still on its way comes first; the end of the last input then completes the stop.
-void MediaDevice::stop(Orv::DevMDSyncSeqRequest& request) {
-    if (isAnyInputOpen()) {
-        _stopping = request.postpone();
-        return;
-    }
+    if (std::exchange(_isFinished, true)) return;
     try {
-        finishOnce(!_context.hasFailed());
+        finish(isWhole);
     } catch (...) {
         _context.reportFailure(_text, std::current_exception());
     }
+    _context.reportEnd(_text);
+}
+
+void MediaDevice::inputsEnded() {
+    finishOnce(!_context.hasFailed());
+}
+
+void MediaDevice::start(const Orv::DevMDSyncSeqSignals& signals) {
+    if (hasOpenInputs()) _context.expectEnd(_text);
+    signals.ready();
+}
+
+void MediaDevice::stop(Orv::DevMDSyncSeqRequest& request) {
+    stopWhenInputsEnd(request);
+    if (!hasOpenInputs()) inputsEnded();
 }
 
 // A show that was given up leaves nothing half done that looks whole.
 void MediaDevice::abort(Orv::DevMDSyncSeqRequest&) {
     finishOnce(false);
-    _stopping.done();
-}
-
-void MediaDevice::close() {
-    _stopping = Orv::DevMDSyncSeqDone();
 }
 
 }  // namespace MediaHost

@@ -33,8 +33,9 @@ MixerDevice::MixerDevice(const Orv::LiString& name, HostContext& context, Settin
     for (std::size_t i = 0; i < NB_CHANNELS; ++i) {
         const std::string channel = "channel" + std::to_string(i + 1);
         addStrip(channel, _channels[i]);
-        addInput<SoundBuf>(channel.c_str(), "sound/*",
-                           [this, i](const Orv::RCShdPtr<SoundBuf>& buf) { take(i, buf); });
+        _channels[i].input =
+            addInput<SoundBuf>(channel.c_str(), "sound/*",
+                               [this, i](const Orv::RCShdPtr<SoundBuf>& buf) { take(i, buf); });
     }
     addStrip("master", _master);
     _out = addOutput("out", "sound/float");
@@ -67,16 +68,12 @@ void MixerDevice::take(std::size_t channel, const Orv::RCShdPtr<SoundBuf>& buf) 
     while (canMix()) mix();
 }
 
-void MixerDevice::inputEnded(std::size_t) {
-    while (canMix()) mix();
-}
-
 // Every channel that is not at its end has something, and at least one has.
 bool MixerDevice::canMix() const {
     bool hasAny = false;
-    for (std::size_t i = 0; i < NB_CHANNELS; ++i) {
-        const bool has = !_channels[i].waiting.empty();
-        if (!has && isInputOpen(i)) return false;
+    for (const Channel& channel : _channels) {
+        const bool has = !channel.waiting.empty();
+        if (!has && channel.input->isOpen()) return false;
         hasAny = hasAny || has;
     }
     return hasAny;
@@ -135,7 +132,8 @@ void MixerDevice::notifyMeters(std::size_t nbSamples) {
     show(_master);
 }
 
-void MixerDevice::finish(bool) {
+void MixerDevice::finish(bool isWhole) {
+    while (isWhole && canMix()) mix();
     _out->push(createNews(Elem::END));
 }
 

@@ -18,7 +18,6 @@ public:
     MixerDevice(const Orv::LiString& name, HostContext& context, Settings settings);
 
 protected:
-    void inputEnded(std::size_t input) override;
     void finish(bool isWhole) override;
 
 private:
@@ -34,6 +33,7 @@ private:
         float getFactor() const;
     };
     struct Channel : Strip {
+        Orv::RCShdPtr<Sink> input;
         std::deque<Orv::RCShdPtr<SoundBuf>> waiting;
         std::size_t nbTaken = 0;  // samples of the first one
     };

@@ -83,7 +83,6 @@ void RecorderDevice::finish(bool isWhole) {
 
 void RecorderDevice::close() {
     dropFiles();
-    MediaDevice::close();
 }
 
 // Those that are whole have their names already and stay.

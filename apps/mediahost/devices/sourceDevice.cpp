@@ -35,7 +35,11 @@ void SourceDevice::addPictureProperties() {
     number->setUnit("pictures").setRange(0, INT64_MAX);
     _positionProperty = addProperty<std::int64_t>(
         "position", "number of the picture shown last; set: the one to go on with",
-        [this] { return _position.load(); }, [this](const std::int64_t& unit) { _jump = unit; },
+        [this] { return _position.load(); },
+        [this](const std::int64_t& unit) {
+            if (!_pictures) throw MediaError("there are no pictures to go to");
+            _jump = unit;
+        },
         number);
     const auto seconds = Orv::DevMDPropertyDescriptor<double>::create();
     seconds->setUnit("s");

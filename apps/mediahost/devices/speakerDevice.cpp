@@ -48,7 +48,6 @@ void SpeakerDevice::finish(bool isWhole) {
 
 void SpeakerDevice::close() {
     _speaker.reset();
-    MediaDevice::close();
 }
 
 }  // namespace MediaHost

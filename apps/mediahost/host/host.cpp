@@ -29,7 +29,7 @@ namespace MediaHost {
 
 namespace {
 
-constexpr double GET_SECONDS = 2;
+constexpr double ANSWER_SECONDS = 2;
 
 using Entry = Orv::ObjPtr<Orv::DevRegistryEntry>;
 using Create = Entry (*)(const Pipeline::Device&, const char* description, HostContext&);
@@ -94,7 +94,7 @@ public:
     // What is read is the value of now, so several notices in a row may find the same one.
     void print() {
         const Orv::LkGuard guard(_mutex);
-        std::string value = PropertyText::get(_property, GET_SECONDS);
+        std::string value = PropertyText::get(_property, ANSWER_SECONDS);
         if (value == _last) return;
         std::cout << std::to_string(Process::getSecondsSinceStart()) + " s  " + _name + " = " +
                          value + '\n'
@@ -212,13 +212,14 @@ Orv::RCShdPtr<Orv::DevMDPrtcl> Host::getDevice(const std::string& name) {
 
 std::string Host::getProperty(const std::string& property) {
     return doing("cannot get the property \"" + property + '"', [&] {
-        return PropertyText::get(_properties->getProperty(property.c_str()), GET_SECONDS);
+        return PropertyText::get(_properties->getProperty(property.c_str()), ANSWER_SECONDS);
     });
 }
 
 void Host::setProperty(const std::string& property, const std::string& value) {
-    doing("cannot set the property \"" + property + "\" to \"" + value + '"',
-          [&] { PropertyText::set(_properties->getProperty(property.c_str()), value); });
+    doing("cannot set the property \"" + property + "\" to \"" + value + '"', [&] {
+        PropertyText::set(_properties->getProperty(property.c_str()), value, ANSWER_SECONDS);
+    });
 }
 
 void Host::watch(const std::string& property) {

@@ -56,6 +56,7 @@ public:
     double getPlayedSeconds() const { return _playedSeconds; }  ///< From the start to the last end.
 
     Orv::RCShdPtr<Orv::DevMDPrtcl> getDevice(const std::string& name);
+    Orv::DevMgr& getManager() { return *_manager; }
     Orv::DevMgrPropertyAcc& getProperties() { return *_properties; }
     Orv::DevMgrSyncSeqAcc& getSequence() { return *_sequence; }
 

@@ -37,9 +37,7 @@ std::string format(const char* pattern, double value) {
 
 Progress::Progress(Host& host) : _host(host), _isTerminal(Process::isTerminal()) {
     for (const Pipeline::Device& spec : host.getPipeline().devices) {
-        const auto device = Orv::RCShdPtr<MediaDevice>::dynamicCast(host.getDevice(spec.name));
-        if (!device.isNull()) _devices.push_back(device);
-        const auto source = Orv::RCShdPtr<SourceDevice>::dynamicCast(device);
+        const auto source = Orv::RCShdPtr<SourceDevice>::dynamicCast(host.getDevice(spec.name));
         if (!_position.isNull() || source.isNull() || source->getPictureFormat() == nullptr)
             continue;
         _rate = source->getPictureFormat()->rate.toDouble();
@@ -92,7 +90,9 @@ std::string Progress::makeText(std::int64_t position) const {
         text += format("  late %.2f ms", context.pacer.getLateness().p99Seconds * 1e3);
     }
     text += "  queues";
-    for (const auto& device : _devices) text += ' ' + std::to_string(device->getQueueLength());
+    for (const Orv::DevMgr::Device& device : _host.getManager().getDevices()) {
+        text += ' ' + std::to_string(device.nbWaiting);
+    }
     return text;
 }
 

@@ -2,12 +2,10 @@
 
 #include <orv/devMDProperty.h>
 #include <string>
-#include <vector>
 
 namespace MediaHost {
 
 class Host;
-class MediaDevice;
 
 /// Shows how far the show is: on a terminal as a bar that is drawn over and over, elsewhere as a
 /// line each second.
@@ -27,7 +25,6 @@ private:
     Orv::RCShdPtr<Orv::DevMDProperty<std::int64_t>> _position;  // null without pictures
     double _rate = 0;                                           // of the pictures
     double _duration = 0;                                       // seconds; 0: unknown
-    std::vector<Orv::RCShdPtr<MediaDevice>> _devices;
     double _nextSeconds = 0;
     bool _isBarOpen = false;
 

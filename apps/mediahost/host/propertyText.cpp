@@ -113,14 +113,15 @@ T parse(const std::string& text) {
 
 struct Setter {
     const std::string& text;
+    double seconds;
     template <class T>
     void apply(Orv::DevMDProperty<T>& property) {
         if constexpr (IS_TEXT<T>) {
-            property.set(toTextValue(text));
+            property.setAndWait(toTextValue(text), seconds);
         } else if constexpr (Orv::DevMDValueTraits<T>::IS_VECTOR) {
             throw MediaError("a list of values cannot be set as text");
         } else {
-            property.set(parse<T>(text));
+            property.setAndWait(parse<T>(text), seconds);
         }
     }
 };
@@ -139,8 +140,8 @@ std::string get(const Property& property, double seconds) {
     return getter.text;
 }
 
-void set(const Property& property, const std::string& value) {
-    Setter setter{value};
+void set(const Property& property, const std::string& value, double seconds) {
+    Setter setter{value, seconds};
     visit(property, setter);
 }
 

@@ -90,7 +90,7 @@ void DevMDStdDevice::addToSet(const LiString& path, RCShdPtr<DevMDPropertyAny> p
     builder->addProperty(std::move(property));
 }
 
-RCShdPtr<DevMDStdStreamPassiveSink> DevMDStdDevice::addSink(
+RCShdPtr<DevMDStdStreamFunctionSink> DevMDStdDevice::addSink(
     const LiString& name, const LiString& description, DevMDStdStreamFunctionSink::Take take,
     DevMDStdStreamFunctionSink::IsCompatible isCompatible) {
     const RCShdPtr<DevMDStdStreamFunctionSink> sink(

@@ -54,7 +54,7 @@ protected:
 
     /// A sink that other devices push into; @p take sees each element. What it throws, the source's
     /// next push() throws; see DevMDStdStreamFunctionSink.
-    RCShdPtr<DevMDStdStreamPassiveSink> addSink(
+    RCShdPtr<DevMDStdStreamFunctionSink> addSink(
         const LiString& name, const LiString& description, DevMDStdStreamFunctionSink::Take take,
         DevMDStdStreamFunctionSink::IsCompatible isCompatible = nullptr);
 

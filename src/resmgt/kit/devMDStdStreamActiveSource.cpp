@@ -1,5 +1,6 @@
 #include "devMDStdStreamActiveSource.h"
 
+#include <cxxabi.h>
 #include <utility>
 
 #include "assertions.h"
@@ -8,6 +9,21 @@
 namespace Orv {
 
 using Elem = DevMDStreamElem;
+
+namespace {
+
+/// To a sink that has thrown: its device may be waiting for the stream to end.
+void pushFailed(const DevMDStdStreamActiveEnd<DevMDStreamPassiveSink>::Use& sink) {
+    try {
+        sink->push(DevMDStdStreamNews::create(Elem::FAILED));
+    } catch (const abi::__forced_unwind&) {
+        throw;
+    } catch (...) {
+        // What it has thrown before, or its device has gone.
+    }
+}
+
+}  // namespace
 
 DevMDStdStreamActiveSource::DevMDStdStreamActiveSource(const LiString& name,
                                                        const LiString& description)
@@ -48,6 +64,7 @@ bool DevMDStdStreamActiveSource::pushAndJudge(ObjPtr<Elem> elem, std::exception_
                     DevMDStdStreamNews::describe("pushing into", _name).c_str());
             }
             _end.end(State::FAILED, std::current_exception());
+            if (state == State::RUNNING) pushFailed(sink);
         }
     }
     const State after = _end.getState();
