@@ -32,8 +32,8 @@ TEST(SeSourceClock, countsByTheTimeAndNotByTheBeats) {
     SeSourceClock clock("clock", interval);
     ClientRecord record;
     std::atomic<std::uint32_t> lastTick{0};
-    SeSyncEngine engine;
     const auto before = Clock::now();
+    SeSyncEngine engine;  // the client uses all that stands above until the engine has gone
     ObjPtr<SeClientThread> client(new TestClient(record, [&](const Beat& beat) {
         EXPECT_GE(secondsSince(before), interval * beat.tick);  // none comes too early
         if (beat.tick < 20) std::this_thread::sleep_for(std::chrono::milliseconds(5));
